@@ -1,0 +1,72 @@
+#include "frame/ExtensionModuleSteam.h"
+
+#include <steam/steam_api.h>
+
+#include "frame/CommandChannel.h"
+#include "frame/SteamManager.h"
+#include "host/HostServices.h"
+#include "services/achievements/AchievementImplementationSteam.h"
+#include "services/achievements/SteamAchievements.h"
+#include "services/cloud/CloudImplementationSteam.h"
+
+const char* ExtensionModuleSteam::GetName()
+{
+    return "Steam";
+}
+
+bool ExtensionModuleSteam::Initialize(HostServices* services)
+{
+    hostServices = services;  // first: the start-up logs and posts events
+    if (!steamManager.Start())
+        return false;
+    CreateServices();
+    return true;
+}
+
+void ExtensionModuleSteam::Shutdown()
+{
+    if (steamAchievements != nullptr) {
+        steamAchievements->UnregisterCallbacks();
+        delete steamAchievements;
+        steamAchievements = nullptr;
+    }
+    if (steamManager.initialised)
+        SteamAPI_Shutdown();
+    steamManager.initialised = false;
+}
+
+bool ExtensionModuleSteam::IsOverlayActive()
+{
+    return steamManager.overlayActive;
+}
+
+void ExtensionModuleSteam::Update()
+{
+    if (steamManager.initialised)
+        SteamAPI_RunCallbacks();
+    // The store's purchase scan joins here once the store service exists.
+}
+
+const char* ExtensionModuleSteam::Command(const char* name, const char* argument)
+{
+    return DispatchCommand(name, argument);
+}
+
+BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumber)
+{
+    switch (serviceNumber) {
+    case kServiceCloud: return cloud;
+    case kServiceAchievements: return achievements;
+    // Store (4), leaderboards (2) and workshop (6) are not built yet: their
+    // fields stay null, as before a successful Initialize.
+    default: return nullptr;
+    }
+}
+
+void ExtensionModuleSteam::CreateServices()
+{
+    // Strictly in the order store, leaderboards, cloud, achievements, workshop,
+    // each pointer stored as soon as its object exists.
+    cloud = new CloudImplementationSteam();
+    achievements = new AchievementImplementationSteam();
+}

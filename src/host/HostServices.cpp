@@ -1,0 +1,3 @@
+#include "host/HostServices.h"
+
+HostServices* hostServices = nullptr;
