@@ -1,0 +1,43 @@
+// One loaded data file: its arrays in file order. Built once by a loader, then
+// only read, by any thread and with no lock.
+#pragma once
+
+#include "data/DataArray.h"
+#include "data/HashedName.h"
+#include "foundation/PtrArray.h"
+
+class XmlReader;
+
+class Database {
+public:
+    Database() = default;
+    // Destroys every array and frees the path (only the cache does this, at exit).
+    ~Database();
+
+    Database(const Database&) = delete;
+    Database& operator=(const Database&) = delete;
+
+    // Building (loaders only).
+    // As HashedName::Set, but a null path is stored as the empty text.
+    void SetPath(const char* text);
+    // Destroys every array and keeps the block and the path, so that a failed
+    // load leaves an empty database and a retry starts clean.
+    void Clear();
+    // Creates an array with no name, owned by this database, and appends it.
+    DataArray* AddArray();
+
+    // The first array named `name`, compared by text; arrays with no name are
+    // skipped. Null if there is none, or if `name` is null.
+    const DataArray* FindArray(const char* name) const;
+
+    // Loading, implemented beside the readers: choose the reader by the path's
+    // ending, read an XML file (retrying through the engine's popup), or a CSV file.
+    bool Load(const char* newPath);
+    bool LoadXmlWithRetry(const char* newPath);
+    bool LoadXml(const char* newPath);
+    bool ReadXmlBlocks(XmlReader& reader);
+    bool LoadCsv(const char* newPath);
+
+    HashedName path;                // never null once set: the key of the cache
+    PtrArray<DataArray> arrays;     // owned
+};

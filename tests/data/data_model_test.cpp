@@ -1,0 +1,277 @@
+#include <cstring>
+#include <string>
+
+#include <gtest/gtest.h>
+
+#include "../foundation/CountingTextHeap.h"
+#include "data/DataArray.h"
+#include "data/DataNode.h"
+#include "data/Database.h"
+#include "data/HashedName.h"
+
+namespace {
+
+// "bA" and "af" hash alike (98 * 37 + 65 == 97 * 37 + 102): only the text tells them apart.
+constexpr const char* kCollideA = "bA";
+constexpr const char* kCollideB = "af";
+
+TEST(HashText, Values)
+{
+    // Catches signed bytes, a counted terminator, or a different multiplier.
+    // Expected values worked out by hand from h = h * 37 + byte mod 2^32.
+    struct Row {
+        const char* text;
+        uint32_t hash;
+    };
+    const Row rows[] = {
+        {nullptr, 0},
+        {"", 0},
+        {"a", 97},
+        {"abc", 136518},
+        {"id", 3985},
+        {"DATA", 3536562},
+        {"\xff", 255},
+        {"\xff\x80", 9563},
+        {"\x80" "abc", 6620102},
+        {"zzzzzzzzzz", 3689885900u},
+        {"leaderboards/leaderboards.xml", 1999625986u},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.text != nullptr ? row.text : "(null)");
+        EXPECT_EQ(HashText(row.text), row.hash);
+    }
+    EXPECT_EQ(HashText(kCollideA), HashText(kCollideB));
+}
+
+TEST(HashedName, SetCopiesAndHashes)
+{
+    // Catches a name that keeps the caller's pointer, or frees its text before copying it.
+    char source[] = "abc";
+    HashedName name;
+    name.Set(source);
+    ASSERT_NE(name.text, nullptr);
+    EXPECT_NE(name.text, source);
+    source[0] = 'X';
+    EXPECT_STREQ(name.text, "abc");
+    EXPECT_EQ(name.hash, 136518u);
+
+    name.Set(name.text + 1);
+    EXPECT_STREQ(name.text, "bc");
+    EXPECT_EQ(name.hash, HashText("bc"));
+
+    name.Set(nullptr);
+    EXPECT_EQ(name.text, nullptr);
+    EXPECT_EQ(name.hash, 0u);
+}
+
+TEST(Database, SetPathNeverLeavesNull)
+{
+    Database database;
+    database.SetPath(nullptr);
+    ASSERT_NE(database.path.text, nullptr);
+    EXPECT_STREQ(database.path.text, "");
+    database.SetPath("Data/Leaderboards.XML");
+    EXPECT_STREQ(database.path.text, "Data/Leaderboards.XML");
+    EXPECT_EQ(database.path.hash, HashText("Data/Leaderboards.XML"));
+}
+
+struct LookupRow {
+    const char* name;
+    const char* expected; // null: nothing found
+};
+
+const char* Show(const char* text)
+{
+    return text != nullptr ? text : "(null)";
+}
+
+TEST(DataNode, GetValue)
+{
+    // Catches a lookup that trusts the hash alone, matches a nameless pair, or finds a later duplicate.
+    DataNode node;
+    node.AddValue("id", "node-1");
+    node.AddValue(nullptr, "nameless");
+    node.AddValue("", "empty-name");
+    node.AddValue("name", "first");
+    node.AddValue("name", "second");
+    node.AddValue("novalue", nullptr);
+    node.AddValue(kCollideA, "collide");
+    ASSERT_EQ(node.values.count, 7);
+
+    const LookupRow rows[] = {
+        {"id", "node-1"},
+        {"", "empty-name"},
+        {"name", "first"},
+        {"Name", nullptr},
+        {"novalue", nullptr},
+        {"missing", nullptr},
+        {kCollideA, "collide"},
+        {kCollideB, nullptr},
+        {nullptr, nullptr},
+    };
+    for (const LookupRow& row : rows) {
+        SCOPED_TRACE(Show(row.name));
+        const char* value = node.GetValue(row.name);
+        if (row.expected == nullptr) {
+            EXPECT_EQ(value, nullptr);
+        } else {
+            ASSERT_NE(value, nullptr);
+            EXPECT_STREQ(value, row.expected);
+        }
+    }
+}
+
+TEST(DataNode, AddValueStoresPrivateCopiesInFileOrder)
+{
+    char name[] = "key";
+    char value[] = "value";
+    DataNode node;
+    node.SetId("n");
+    node.AddValue(name, value);
+    node.AddValue(nullptr, nullptr);
+    name[0] = 'X';
+    value[0] = 'X';
+    ASSERT_EQ(node.values.count, 2);
+    EXPECT_STREQ(node.values[0].name.text, "key");
+    EXPECT_STREQ(node.values[0].value, "value");
+    EXPECT_EQ(node.values[0].name.hash, HashText("key"));
+    EXPECT_EQ(node.values[1].name.text, nullptr);
+    EXPECT_EQ(node.values[1].value, nullptr);
+    EXPECT_STREQ(node.id.text, "n");
+}
+
+TEST(DataNode, HeapExhaustionGivesNullTextsThatLookupsSkip)
+{
+    // Catches a lookup that dereferences a name the heap refused to copy.
+    DataNode node;
+    {
+        CountingTextHeap heap;
+        heap.FailAll();
+        node.AddValue("a", "b");
+    }
+    ASSERT_EQ(node.values.count, 1);
+    EXPECT_EQ(node.values[0].name.text, nullptr);
+    EXPECT_EQ(node.GetValue("a"), nullptr);
+    EXPECT_EQ(node.GetValue(""), nullptr);
+}
+
+TEST(DataArray, FindNode)
+{
+    // Catches a null id taken as the empty one (both hash to 0), and a hash-only match.
+    Database database;
+    DataArray* array = database.AddArray();
+    DataNode* noId = array->AddNode();
+    DataNode* emptyId = array->AddNode();
+    emptyId->SetId("");
+    DataNode* x1 = array->AddNode();
+    x1->SetId("x");
+    DataNode* x2 = array->AddNode();
+    x2->SetId("x");
+    DataNode* collide = array->AddNode();
+    collide->SetId(kCollideA);
+    array->nodes.Add(nullptr);                // a hole is skipped, here and at destruction
+
+    struct Row {
+        const char* id;
+        const DataNode* expected;
+    };
+    const Row rows[] = {
+        {"", emptyId}, {"x", x1}, {"X", nullptr}, {kCollideA, collide},
+        {kCollideB, nullptr}, {"missing", nullptr}, {nullptr, nullptr},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(Show(row.id));
+        EXPECT_EQ(array->FindNode(row.id), row.expected);
+    }
+    EXPECT_NE(x2, x1);
+    EXPECT_EQ(noId->array, array);
+    EXPECT_EQ(array->database, &database);
+}
+
+TEST(DataArray, FindNodeWithoutNodesOrArray)
+{
+    DataArray empty;
+    EXPECT_EQ(empty.FindNode(""), nullptr);
+    EXPECT_EQ(DataArray::FindNode(nullptr, "x"), nullptr);
+
+    Database database;
+    database.AddArray()->SetName("A");
+    database.arrays[0]->AddNode()->SetId("x");
+    EXPECT_NE(DataArray::FindNode(database.FindArray("A"), "x"), nullptr);
+    EXPECT_EQ(DataArray::FindNode(database.FindArray("B"), "x"), nullptr);
+}
+
+TEST(DataArray, SetValue)
+{
+    // Catches "id" stored as a pair, a null value that erases, or a repeat that appends.
+    DataArray array;
+    array.SetValue("id", "first");
+    array.SetValue("kind", "a");
+    array.SetValue("id", "board");
+    array.SetValue("kind", "b");
+    array.SetValue("kind", nullptr);
+    array.SetValue("empty", nullptr);
+    array.SetValue(nullptr, "ignored");
+    array.SetValue("Kind", "c");
+
+    EXPECT_STREQ(array.name.text, "board");
+    EXPECT_EQ(array.name.hash, HashText("board"));
+    ASSERT_EQ(array.values.count, 3);
+    EXPECT_STREQ(array.values[0].name.text, "kind");
+    EXPECT_STREQ(array.values[0].value, "b");
+    EXPECT_STREQ(array.values[1].name.text, "empty");
+    EXPECT_EQ(array.values[1].value, nullptr);
+    EXPECT_STREQ(array.values[2].name.text, "Kind");
+
+    array.SetValue("empty", "now");
+    EXPECT_STREQ(array.values[1].value, "now");
+    array.SetValue("id", nullptr);
+    EXPECT_EQ(array.name.text, nullptr);
+}
+
+TEST(Database, FindArray)
+{
+    // Catches a nameless array matched by the empty text, or a later duplicate returned.
+    Database database;
+    DataArray* nameless = database.AddArray();
+    DataArray* empty = database.AddArray();
+    empty->SetName("");
+    DataArray* a1 = database.AddArray();
+    a1->SetName("A");
+    DataArray* b = database.AddArray();
+    b->SetName("B");
+    DataArray* a2 = database.AddArray();
+    a2->SetName("A");
+
+    struct Row {
+        const char* name;
+        const DataArray* expected;
+    };
+    const Row rows[] = {{"A", a1}, {"B", b}, {"", empty}, {"a", nullptr}, {"C", nullptr}, {nullptr, nullptr}};
+    for (const Row& row : rows) {
+        SCOPED_TRACE(Show(row.name));
+        EXPECT_EQ(database.FindArray(row.name), row.expected);
+    }
+    EXPECT_NE(nameless, a2);
+}
+
+TEST(Database, ClearKeepsPathAndBlock)
+{
+    // Catches a Clear that frees the block or the path, or leaves arrays findable.
+    Database database;
+    database.SetPath("x.xml");
+    database.AddArray()->SetName("A");
+    database.AddArray()->AddNode()->AddValue("k", "v");
+    DataArray** block = database.arrays.data;
+    database.Clear();
+    EXPECT_EQ(database.arrays.count, 0);
+    EXPECT_EQ(database.arrays.data, block);
+    EXPECT_STREQ(database.path.text, "x.xml");
+    for (const char* name : {"A", "", "x"})
+        EXPECT_EQ(database.FindArray(name), nullptr) << name;
+
+    database.AddArray()->SetName("again");
+    EXPECT_NE(database.FindArray("again"), nullptr);
+}
+
+} // namespace

@@ -1,0 +1,78 @@
+// Record layouts must match the platform's 4-byte callback packing on this OS.
+#include <cstddef>
+
+#include <gtest/gtest.h>
+#include <steam/steam_api.h>
+
+#define CHECK_SIZE(T, n) static_assert(sizeof(T) == (n), #T " size")
+#define CHECK_OFFSET(T, f, n) static_assert(offsetof(T, f) == (n), #T "::" #f " offset")
+
+CHECK_SIZE(CSteamID, 8);
+static_assert(alignof(CSteamID) == 1, "CSteamID is byte-aligned");
+CHECK_SIZE(GameOverlayActivated_t, 1);
+CHECK_SIZE(UserStatsReceived_t, 20);
+CHECK_OFFSET(UserStatsReceived_t, m_eResult, 8);
+CHECK_OFFSET(UserStatsReceived_t, m_steamIDUser, 12);
+CHECK_SIZE(UserStatsStored_t, 12);
+CHECK_SIZE(UserAchievementStored_t, 148);
+CHECK_OFFSET(UserAchievementStored_t, m_rgchAchievementName, 9);
+CHECK_OFFSET(UserAchievementStored_t, m_nCurProgress, 140);
+CHECK_OFFSET(UserAchievementStored_t, m_nMaxProgress, 144);
+CHECK_SIZE(LeaderboardFindResult_t, 12);
+CHECK_SIZE(LeaderboardScoresDownloaded_t, 20);
+CHECK_OFFSET(LeaderboardScoresDownloaded_t, m_cEntryCount, 16);
+CHECK_SIZE(LeaderboardScoreUploaded_t, 28);
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_hSteamLeaderboard, 4);
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nScore, 12);
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_bScoreChanged, 16);
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankNew, 20);
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankPrevious, 24);
+CHECK_SIZE(SteamUGCQueryCompleted_t, 280);
+CHECK_OFFSET(SteamUGCQueryCompleted_t, m_bCachedData, 20);
+CHECK_OFFSET(SteamUGCQueryCompleted_t, m_rgchNextCursor, 21);
+CHECK_SIZE(CreateItemResult_t, 16);
+CHECK_OFFSET(CreateItemResult_t, m_nPublishedFileId, 4);
+CHECK_OFFSET(CreateItemResult_t, m_bUserNeedsToAcceptWorkshopLegalAgreement, 12);
+CHECK_SIZE(SubmitItemUpdateResult_t, 16);
+CHECK_OFFSET(SubmitItemUpdateResult_t, m_bUserNeedsToAcceptWorkshopLegalAgreement, 4);
+CHECK_OFFSET(SubmitItemUpdateResult_t, m_nPublishedFileId, 8);
+CHECK_SIZE(LeaderboardEntry_t, 28);
+CHECK_OFFSET(LeaderboardEntry_t, m_hUGC, 20);
+CHECK_SIZE(SteamParamStringArray_t, 12);
+CHECK_SIZE(SteamUGCDetails_t, 9764);
+CHECK_OFFSET(SteamUGCDetails_t, m_ulSteamIDOwner, 8156);
+CHECK_OFFSET(SteamUGCDetails_t, m_eVisibility, 8176);
+CHECK_OFFSET(SteamUGCDetails_t, m_rgchTags, 8183);
+CHECK_OFFSET(SteamUGCDetails_t, m_hFile, 9208);
+CHECK_OFFSET(SteamUGCDetails_t, m_pchFileName, 9224);
+CHECK_OFFSET(SteamUGCDetails_t, m_nFileSize, 9484);
+CHECK_OFFSET(SteamUGCDetails_t, m_rgchURL, 9492);
+CHECK_OFFSET(SteamUGCDetails_t, m_unNumChildren, 9760);
+CHECK_SIZE(RemoteStorageSubscribePublishedFileResult_t, 12);
+CHECK_SIZE(PersonaStateChange_t, 12);
+
+TEST(Layout, CallbackNumbers) {
+  EXPECT_EQ(GameOverlayActivated_t::k_iCallback, 331);
+  EXPECT_EQ(PersonaStateChange_t::k_iCallback, 304);
+  EXPECT_EQ(UserStatsReceived_t::k_iCallback, 1101);
+  EXPECT_EQ(UserStatsStored_t::k_iCallback, 1102);
+  EXPECT_EQ(UserAchievementStored_t::k_iCallback, 1103);
+  EXPECT_EQ(LeaderboardFindResult_t::k_iCallback, 1104);
+  EXPECT_EQ(LeaderboardScoresDownloaded_t::k_iCallback, 1105);
+  EXPECT_EQ(LeaderboardScoreUploaded_t::k_iCallback, 1106);
+  EXPECT_EQ(RemoteStorageSubscribePublishedFileResult_t::k_iCallback, 1313);
+  EXPECT_EQ(RemoteStorageUnsubscribePublishedFileResult_t::k_iCallback, 1315);
+  EXPECT_EQ(SteamUGCQueryCompleted_t::k_iCallback, 3401);
+  EXPECT_EQ(CreateItemResult_t::k_iCallback, 3403);
+  EXPECT_EQ(SubmitItemUpdateResult_t::k_iCallback, 3404);
+}
+
+TEST(Layout, SteamIdBitFields) {
+  CSteamID id(42u, k_EUniversePublic, k_EAccountTypeIndividual);
+  EXPECT_EQ(id.ConvertToUint64(), 76561197960265728ull + 42);
+  EXPECT_EQ(id.GetAccountID(), 42u);
+  EXPECT_EQ(id.GetUnAccountInstance(), 1u);
+  EXPECT_TRUE(id.IsValid());
+  EXPECT_TRUE(id.BIndividualAccount());
+  EXPECT_FALSE(k_steamIDNil.IsValid());
+}
