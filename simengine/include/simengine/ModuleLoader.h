@@ -1,0 +1,38 @@
+// Loads the module file the way the engine does: dlopen with RTLD_NOW |
+// RTLD_LOCAL, look up "OB_GetExtensionModuleInterface", call it. Unloading
+// first quits and joins the engine's threads (the module never joins its own,
+// and they run the module's code), then closes the library so that the next
+// load starts with fresh module statics.
+#pragma once
+
+#include <string>
+
+#include "frame/ExtensionModule.h"
+
+namespace simengine {
+
+class ModuleLoader {
+public:
+    ModuleLoader() = default;
+    ~ModuleLoader();
+    ModuleLoader(const ModuleLoader&) = delete;
+    ModuleLoader& operator=(const ModuleLoader&) = delete;
+
+    // False with Error() set when the file, the export or its object is missing.
+    bool Load(const std::string& path);
+    ExtensionModule* Module() const { return module_; }
+    bool IsLoaded() const { return library_ != nullptr; }
+    const std::string& Error() const { return error_; }
+
+    // Quits and joins the engine's threads, then dlclose. True if the library
+    // is really gone from the process afterwards (its statics will be fresh).
+    bool Unload();
+
+private:
+    void* library_ = nullptr;
+    ExtensionModule* module_ = nullptr;
+    std::string path_;
+    std::string error_;
+};
+
+}  // namespace simengine
