@@ -52,12 +52,24 @@ bool ModuleLoader::Load(const std::string& path)
     return true;
 }
 
+void ModuleLoader::ReleaseModuleObjects()
+{
+    // The module never destroys its objects; the engine releases the services
+    // and the module through their virtual destructors before the code goes away.
+    constexpr int32_t kServiceNumbers[] = {kServiceStore, kServiceLeaderboards, kServiceCloud,
+                                           kServiceAchievements, kServiceWorkshop};
+    for (int32_t number : kServiceNumbers)
+        delete module_->GetImplementation(number);
+    delete module_;
+    module_ = nullptr;
+}
+
 bool ModuleLoader::Unload()
 {
     if (library_ == nullptr)
         return true;
     Engine::Instance().QuitAndJoin();
-    module_ = nullptr;
+    ReleaseModuleObjects();
     bool closed = dlclose(library_) == 0;
     library_ = nullptr;
     if (!closed) {

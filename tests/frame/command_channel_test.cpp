@@ -110,8 +110,9 @@ TEST_F(CommandChannel, EightStatisticResultsStayReadableTheNinthReusesTheFirst)
     for (int i = 0; i < 8; ++i) {
         SCOPED_TRACE(i);
         ASSERT_NE(answers[i], nullptr);
-        if (i > 0)
+        if (i > 0) {
             EXPECT_STREQ(answers[i], std::to_string((i + 1) * 11).c_str());
+        }
     }
     EXPECT_EQ(answers[8], answers[0]);
     EXPECT_STREQ(answers[0], "99");

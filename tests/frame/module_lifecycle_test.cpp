@@ -49,6 +49,7 @@ TEST_F(ModuleLifecycle, ExportGivesOneObjectEvenWhenCallsRace)
     for (ExtensionModule* each : seen)
         EXPECT_EQ(each, seen[0]);
     EXPECT_EQ(entry(), seen[0]);
+    delete seen[0];
     dlclose(library);
     ASSERT_TRUE(loader.Load(STEAMEXT_MODULE_PATH)) << loader.Error();
     module = loader.Module();

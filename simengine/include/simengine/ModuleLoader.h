@@ -24,11 +24,14 @@ public:
     bool IsLoaded() const { return library_ != nullptr; }
     const std::string& Error() const { return error_; }
 
-    // Quits and joins the engine's threads, then dlclose. True if the library
+    // Quits and joins the engine's threads, releases the services and the
+    // module object through their virtual destructors, then dlclose. True if the library
     // is really gone from the process afterwards (its statics will be fresh).
     bool Unload();
 
 private:
+    void ReleaseModuleObjects();
+
     void* library_ = nullptr;
     ExtensionModule* module_ = nullptr;
     std::string path_;
