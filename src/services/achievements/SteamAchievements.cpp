@@ -23,7 +23,7 @@ void StatsUpdaterThread(void* /*unused*/)
                 SteamUserStats()->StoreStats();
             lastStore = hostServices->GetTimeMs();
         }
-        hostServices->ThreadSleep(kUpdaterSleepMs);
+        hostServices->threads->ThreadSleep(kUpdaterSleepMs);
     }
     if (SteamUserStats() != nullptr)
         SteamUserStats()->StoreStats();
