@@ -80,6 +80,11 @@ void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle
 
 void CCallbackMgr::RunCallbacks() {
   WorldState& s = State();
+  // Idle fast path: with the journal off and nothing queued, a pump has nothing to do
+  // (no pending item depends on the pump count while the queue is empty).
+  if (!s.journalEnabled.load(std::memory_order_relaxed) &&
+      s.queuedCount.load(std::memory_order_acquire) == 0)
+    return;
   std::vector<Pending> due;
   {
     std::lock_guard<std::mutex> lock(s.mutex);
@@ -94,6 +99,7 @@ void CCallbackMgr::RunCallbacks() {
         ++it;
       }
     }
+    s.SyncQueuedCount();
   }
   t_dispatching = true;
   for (Pending& item : due) {

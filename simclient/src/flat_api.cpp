@@ -47,7 +47,8 @@ S_API bool S_CALLTYPE SteamAPI_Init() {
 S_API void S_CALLTYPE SteamAPI_Shutdown() {
   CallScope call("SteamAPI_Shutdown", "");
   call.state.initialised = false;
-  call.state.queue.clear();  // results of calls in flight are lost with the connection
+  call.state.queue.clear();
+  call.state.SyncQueuedCount();  // results of calls in flight are lost with the connection
   call.state.BumpGeneration();
 }
 

@@ -91,6 +91,7 @@ void World::ClearFaults() { auto l = Lock(); State().faults.clear(); }
 
 Journal World::GetJournal() const { auto l = Lock(); return Journal(State().journal); }
 void World::ClearJournal() { auto l = Lock(); State().journal.clear(); }
+void World::SetJournalEnabled(bool enabled) { State().journalEnabled.store(enabled); }
 
 bool World::EmitWarning(int severity, const char* text) {
   SteamAPIWarningMessageHook_t hook;

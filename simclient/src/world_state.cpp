@@ -14,6 +14,7 @@ WorldState& State() {
 }
 
 void WorldState::Record(const char* name, std::string args) {
+  if (!journalEnabled.load(std::memory_order_relaxed)) return;
   journal.push_back(JournalEntry{name, std::move(args), std::this_thread::get_id()});
 }
 
@@ -56,6 +57,7 @@ void WorldState::QueueCallback(int callbackId, const void* data, std::size_t siz
   p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
   p.onDeliver = std::move(onDeliver);
   queue.push_back(std::move(p));
+  SyncQueuedCount();
 }
 
 SteamAPICall_t WorldState::QueueCallResult(int callbackId, const void* data, std::size_t size,
@@ -70,10 +72,12 @@ SteamAPICall_t WorldState::QueueCallResult(int callbackId, const void* data, std
   p.ioFailure = f.ioFailure;
   p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
   queue.push_back(std::move(p));
+  SyncQueuedCount();
   return handle;
 }
 
 void WorldState::ResetData() {
+  journalEnabled.store(true);
   steamRunning = true;
   initSucceeds = true;
   initialised = false;
@@ -92,6 +96,7 @@ void WorldState::ResetData() {
   latency = 1;
   pump = 0;
   queue.clear();
+  SyncQueuedCount();
   faults.clear();
   journal.clear();
   stats.clear();

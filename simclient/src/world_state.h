@@ -138,6 +138,10 @@ struct WorldState {
   // --- helpers; all expect the mutex held ---
   void BumpGeneration() { generation.fetch_add(1, std::memory_order_acq_rel); }
   void Record(const char* name, std::string args);
+  // Mirrors of state read without the lock by the idle pump's fast path.
+  std::atomic<bool> journalEnabled{true};
+  std::atomic<std::size_t> queuedCount{0};
+  void SyncQueuedCount() { queuedCount.store(queue.size(), std::memory_order_release); }
   AppliedFaults TakeFaults(const std::string& call);
   // Queues a broadcast callback after the configured latency.
   void QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency = 0,

@@ -724,6 +724,9 @@ void XmlReader::ReportParseError(const char* reason, int character)
 
     cursor = static_cast<int32_t>(size);
     active = false;
+    // The character goes out as a plain (signed) char promoted to int, so a byte
+    // above 127 prints in hex as a negative number would, e.g. ffffffe9.
+    const int promoted = static_cast<signed char>(character);
     Report("Parsing error (%s) around line %d in XML '%s'. Unexpected character '%c' (%x) at:\n'%s'", reason, line,
-           path, character, static_cast<unsigned>(character), excerpt);
+           path, promoted, static_cast<unsigned>(promoted), excerpt);
 }

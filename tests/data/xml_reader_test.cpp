@@ -60,7 +60,7 @@ std::string ParseError(const std::string& reason, int line, char character, cons
     char text[1024];
     std::snprintf(text, sizeof text,
                   "Parsing error (%s) around line %d in XML 't.xml'. Unexpected character '%c' (%x) at:\n'%s'",
-                  reason.c_str(), line, character, static_cast<unsigned>(static_cast<unsigned char>(character)),
+                  reason.c_str(), line, character, static_cast<unsigned>(static_cast<int>(character)),
                   excerpt.c_str());
     return std::string(text, std::strlen(text));
 }
@@ -153,6 +153,8 @@ TEST(XmlReaderErrors, EveryRefusal)
         {"<> in a tag", "<>", {}, {ParseError("not expecting '<' yet", 1, '>', ">")}},
         {"nothing between values", "<a b=\"c\"d=\"e\">", {}, {ParseError("Unexpected character after value definition.", 1, 'd', "\"d=\"e\">")}},
         {"quoted word then a letter in text", "x \"y\"z<a>", {}, {ParseError("Unexpected character after value definition.", 1, 'z', "\"z<a>")}},
+        // A byte above 127 prints in hex as the promoted plain char: ffffffe9.
+        {"quoted word then a high byte", "x \"y\"\xe9<a>", {}, {ParseError("Unexpected character after value definition.", 1, '\xe9', "\"\xe9<a>")}},
         {"no =", "<a b>\n", {}, {ParseError("Reading next block (case #1)", 1, '\0', ">\n")}},
         {"digit first in a name", "<a 1b=\"c\">\n", {}, {ParseError("Reading next block (case #1)", 1, '\0', ">\n")}},
         {"no quotes", "<a b=c>\n", {}, {ParseError(expectQuote, 1, 'c', ">\n"), ParseError("Reading next block (case #2)", 2, '\0', "\n")}},

@@ -118,6 +118,9 @@ class World {
   // --- Journal and warnings ----------------------------------------------------------------
   Journal GetJournal() const;
   void ClearJournal();
+  // Off: calls are not journaled, and an idle pump returns without taking the world's
+  // lock (for benchmarks of the module's own overhead). Reset turns it back on.
+  void SetJournalEnabled(bool enabled);
   // Sends text through the hook installed with SetWarningMessageHook; false if none.
   bool EmitWarning(int severity, const char* text);
   bool HasWarningHook() const;
