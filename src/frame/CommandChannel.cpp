@@ -69,7 +69,8 @@ const char* OpenStoreWithAppId(const char* argument)
     // Without the overlay the store opens as an address, with the token as written.
     char url[256];
     FormatToBuffer(url, sizeof url, "steam://purchase/%s", token.text != nullptr ? token.text : "");
-    hostServices->HostCommand("OpenURL", url);
+    if (hostServices != nullptr)  // a command sent before Initialize has no engine to ask
+        hostServices->HostCommand("OpenURL", url);
     return nullptr;
 }
 

@@ -61,6 +61,16 @@ TEST_F(CommandChannel, NullAndUnknownInputsAnswerNull)
     EXPECT_EQ(Run("GameCenter", "IsAvailable"), "OK");
 }
 
+TEST_F(CommandChannel, BeforeInitializeCommandsAnswerWithoutTheEngine)
+{
+    // No table yet: the store address cannot be opened, and nothing may crash.
+    EXPECT_EQ(Run("OpenStoreWithAppId", "440"), std::nullopt);
+    EXPECT_EQ(Run("GetLanguage", nullptr), std::nullopt);
+    EXPECT_EQ(Run("GameCenter", "GetStatisticsInt,kills"), std::nullopt);
+    EXPECT_EQ(Run("GameCenter", "IsAvailable"), "OK");
+    EXPECT_TRUE(engine.Records().All().Entries().empty());
+}
+
 TEST_F(CommandChannel, UnlockAchievementAlwaysAnswersOk)
 {
     world.DefineAchievement("WIN");
