@@ -115,7 +115,7 @@ bool Database::LoadCsv(const char* newPath)
     while (reader.columnCount > 0 && !reader.AtEnd()) {
         DataNode* node = array->AddNode();
         ++rows;
-        node->values.Reserve(reader.columnCount);
+        node->ReserveValues(reader.columnCount);
         for (int32_t i = 0; i < reader.columnCount; ++i) {
             const bool present =
                 !reader.AtEnd() && reader.ReadField(field, CsvReader::kDataFieldLimit) == CsvReader::Field::Complete;

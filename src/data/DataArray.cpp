@@ -2,11 +2,27 @@
 
 #include <cstring>
 
+#include "foundation/BlockArena.h"
 #include "foundation/TextFormat.h"
 #include "foundation/TextHeap.h"
 
+namespace {
+
+char* CopyValue(const char* value, BlockArena* arena)
+{
+    if (value == nullptr)
+        return nullptr;
+    size_t length = 0;
+    return arena != nullptr ? arena->CopyText(value, &length) : DuplicateText(value);
+}
+
+} // namespace
+
 DataArray::~DataArray()
 {
+    // Texts and nodes of an arena array go with the arena, unvisited.
+    if (arena != nullptr)
+        return;
     name.Free();
     for (DataNode* node : nodes)
         delete node;
@@ -28,23 +44,25 @@ void DataArray::SetValue(const char* pairName, const char* value)
         if (pair.name.text == nullptr || std::strcmp(pair.name.text, pairName) != 0)
             continue;
         if (value != nullptr) {
-            char* copy = DuplicateText(value);
-            FreeText(pair.value);
+            char* copy = CopyValue(value, arena);
+            if (arena == nullptr)
+                FreeText(pair.value);
             pair.value = copy;
         }
         return;
     }
 
     DataValue pair;
-    pair.name.Set(pairName);
-    pair.value = value != nullptr ? DuplicateText(value) : nullptr;
+    pair.name.Set(pairName, arena);
+    pair.value = CopyValue(value, arena);
     values.Add(pair);
 }
 
 DataNode* DataArray::AddNode()
 {
-    DataNode* node = new DataNode;
+    DataNode* node = arena != nullptr ? arena->Create<DataNode>() : new DataNode;
     node->array = this;
+    node->arena = arena;
     nodes.Add(node);
     return node;
 }

@@ -2,10 +2,16 @@
 
 #include <cstring>
 
+#include "foundation/BlockArena.h"
 #include "foundation/TextFormat.h"
 
 DataNode::~DataNode()
 {
+    if (arena != nullptr) {
+        // The arena releases the texts and the block.
+        values.ForgetBlock();
+        return;
+    }
     id.Free();
     for (DataValue& pair : values)
         pair.Free();
@@ -14,9 +20,24 @@ DataNode::~DataNode()
 void DataNode::AddValue(const char* name, const char* value)
 {
     DataValue pair;
-    pair.name.Set(name);
-    pair.value = value != nullptr ? DuplicateText(value) : nullptr;
-    values.Add(pair);
+    if (arena == nullptr) {
+        pair.name.Set(name);
+        pair.value = value != nullptr ? DuplicateText(value) : nullptr;
+        values.Add(pair);
+        return;
+    }
+    pair.name.Set(name, arena);
+    size_t length = 0;
+    pair.value = value != nullptr ? arena->CopyText(value, &length) : nullptr;
+    values.Add(pair, *arena);
+}
+
+void DataNode::ReserveValues(int32_t n)
+{
+    if (arena != nullptr)
+        values.Reserve(n, *arena);
+    else
+        values.Reserve(n);
 }
 
 const char* DataNode::GetValue(const char* name) const

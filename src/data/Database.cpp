@@ -18,12 +18,14 @@ void Database::Clear()
     for (DataArray* array : arrays)
         delete array;
     arrays.count = 0;
+    arena.Release();
 }
 
 DataArray* Database::AddArray()
 {
     DataArray* array = new DataArray;
     array->database = this;
+    array->arena = &arena;
     arrays.Add(array);
     return array;
 }

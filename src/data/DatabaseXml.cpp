@@ -23,6 +23,12 @@ bool Named(const XmlBlock* block, const char* keyword)
     return block->name != nullptr && std::strcmp(block->name, keyword) == 0;
 }
 
+// The keyword "id", tested once per attribute.
+bool IsId(const char* name)
+{
+    return name[0] == 'i' && name[1] == 'd' && name[2] == '\0';
+}
+
 template <typename... Args>
 void ReportLoadError(const char* format, Args... args)
 {
@@ -96,7 +102,7 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
         // [3] A new array: "id" names it, the other attributes are its pairs.
         DataArray* array = AddArray();
         for (int32_t i = 0; i < block->count; ++i) {
-            if (std::strcmp(block->attributeNames[i], "id") == 0)
+            if (IsId(block->attributeNames[i]))
                 array->SetName(block->attributeValues[i]);
             else
                 array->SetValue(block->attributeNames[i], block->attributeValues[i]);
@@ -129,13 +135,13 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
             const bool nodeClosing = block->closing;
             const char* id = nullptr;
             for (int32_t i = 0; i < block->count; ++i) {
-                if (std::strcmp(block->attributeNames[i], "id") == 0)
+                if (IsId(block->attributeNames[i]))
                     id = block->attributeValues[i];
             }
             DataNode* node = array->AddNode();
             node->SetId(id);
             ++nodeCount;
-            node->values.Reserve(block->count + 1);
+            node->ReserveValues(block->count + 1);
             for (int32_t i = 0; i < block->count; ++i)
                 node->AddValue(block->attributeNames[i], block->attributeValues[i]);
 

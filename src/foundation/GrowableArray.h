@@ -3,10 +3,13 @@
 // A header of all zero bytes is a valid empty array, so holders that are made by
 // zeroing need no constructor call. The array never owns what its elements point
 // at: holders release that themselves before they drop or clear elements.
-// Blocks come from the throwing allocator; nothing here catches its failure.
+// Blocks come from the throwing allocator, or from an arena's object lane which
+// throws the same way; nothing here catches the failure.
 #pragma once
 
 #include <cstdint>
+
+#include "foundation/BlockArena.h"
 
 // The capacity after an Add that found a full block of `capacity` holding `count`.
 // A one-element block (made by Reserve(1)) steps to 8; any other block doubles.
@@ -32,38 +35,23 @@ public:
 
     // Appends a copy of `item`, which may be an element of this very array: the
     // old block is freed only after the copy is stored.
-    void Add(const Element& item)
-    {
-        if (count + 1 <= capacity) {
-            data[count++] = item;
-            return;
-        }
-        if (data == nullptr) {
-            Reserve(kFirstCapacity);
-            data[count++] = item;
-            return;
-        }
-        Element* old = data;
-        capacity = GrownArrayCapacity(count, capacity);
-        data = new Element[capacity];
-        for (int32_t i = 0; i < count; ++i)
-            data[i] = old[i];
-        data[count++] = item;
-        delete[] old;
-    }
-
+    void Add(const Element& item) { Grow(item, HeapBlocks{}); }
     // Sets the capacity to `n`, or to `count` if that is greater; may shrink the block.
     // Asking for the current capacity does nothing, even with no block yet.
-    void Reserve(int32_t n)
+    void Reserve(int32_t n) { Resize(n, HeapBlocks{}); }
+
+    // The same two for an array whose blocks live in `arena`, with the same
+    // capacities: a new block comes from the arena, and an old one is left to it.
+    // An array takes all its blocks from the heap or all from one arena; the
+    // holder of an arena array empties the header (ForgetBlock) before it goes.
+    void Add(const Element& item, BlockArena& arena) { Grow(item, ArenaBlocks{&arena}); }
+    void Reserve(int32_t n, BlockArena& arena) { Resize(n, ArenaBlocks{&arena}); }
+    // Drops the block without freeing it: for blocks that an arena releases.
+    void ForgetBlock()
     {
-        if (n == capacity)
-            return;
-        capacity = n > count ? n : count;
-        Element* block = new Element[capacity];
-        for (int32_t i = 0; i < count; ++i)
-            block[i] = data[i];
-        delete[] data;
-        data = block;
+        data = nullptr;
+        count = 0;
+        capacity = 0;
     }
 
     // Removal helpers for holders. Both keep the order of the remaining elements
@@ -89,4 +77,49 @@ public:
     int32_t count = 0;
     int32_t capacity = 0;
     bool autoShrink = false;
+
+private:
+    struct HeapBlocks {
+        Element* Allocate(int32_t n) const { return new Element[n]; }
+        void Free(Element* block) const { delete[] block; }
+    };
+    struct ArenaBlocks {
+        BlockArena* arena;
+        Element* Allocate(int32_t n) const { return arena->CreateBlock<Element>(n); }
+        void Free(Element*) const {}
+    };
+
+    template <typename Blocks>
+    void Grow(const Element& item, Blocks blocks)
+    {
+        if (count + 1 <= capacity) {
+            data[count++] = item;
+            return;
+        }
+        if (data == nullptr) {
+            Resize(kFirstCapacity, blocks);
+            data[count++] = item;
+            return;
+        }
+        Element* old = data;
+        capacity = GrownArrayCapacity(count, capacity);
+        data = blocks.Allocate(capacity);
+        for (int32_t i = 0; i < count; ++i)
+            data[i] = old[i];
+        data[count++] = item;
+        blocks.Free(old);
+    }
+
+    template <typename Blocks>
+    void Resize(int32_t n, Blocks blocks)
+    {
+        if (n == capacity)
+            return;
+        capacity = n > count ? n : count;
+        Element* block = blocks.Allocate(capacity);
+        for (int32_t i = 0; i < count; ++i)
+            block[i] = data[i];
+        blocks.Free(data);
+        data = block;
+    }
 };

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include "foundation/BlockArena.h"
 #include "foundation/PtrArray.h"
 #include "foundation/ValueArray.h"
 
@@ -80,6 +81,17 @@ TEST(PtrArray, GrowthSteps)
         Fill(array, row.adds);
         EXPECT_EQ(array.capacity, row.capacity);
         ExpectInOrder(array, row.adds);
+
+        // Blocks from an arena follow the very same steps.
+        BlockArena arena;
+        PtrArray<int> inArena;
+        if (row.reserve >= 0)
+            inArena.Reserve(row.reserve, arena);
+        for (int i = 0; i < row.adds; ++i)
+            inArena.Add(Slot(i), arena);
+        EXPECT_EQ(inArena.capacity, row.capacity);
+        ExpectInOrder(inArena, row.adds);
+        inArena.ForgetBlock();
     }
 }
 
@@ -97,6 +109,15 @@ TEST(PtrArray, AddOfOwnElementAtGrowth)
     single.Add(Slot(7));
     single.Add(single.data[0]);
     EXPECT_EQ(single.data[1], Slot(7));
+
+    BlockArena arena;
+    PtrArray<int> inArena;
+    inArena.Reserve(1, arena);
+    inArena.Add(Slot(7), arena);
+    inArena.Add(inArena.data[0], arena);
+    EXPECT_EQ(inArena.capacity, 8);
+    EXPECT_EQ(inArena.data[1], Slot(7));
+    inArena.ForgetBlock();
 }
 
 TEST(PtrArray, Reserve)
@@ -170,25 +191,37 @@ TEST(PtrArray, Removal)
 
 TEST(ValueArray, NewBlocksAreConstructedAndMovesKeepFields)
 {
-    // Catches elements of a new block left with stale pointers, or a move that loses a field.
-    ValueArray<Pair> array;
-    array.Reserve(1);
-    ASSERT_EQ(array.capacity, 1);
-    Pair first;
-    first.name = "n";
-    first.hash = 110;
-    first.value = "v";
-    array.Add(first);
-    array.Add(array.data[0]);                 // steps to 8, from its own element
-    ASSERT_EQ(array.capacity, 8);
-    for (int i = 0; i < 2; ++i) {
-        EXPECT_STREQ(array.data[i].name, "n");
-        EXPECT_EQ(array.data[i].hash, 110u);
-        EXPECT_STREQ(array.data[i].value, "v");
-    }
-    for (int i = 2; i < array.capacity; ++i) {
-        EXPECT_EQ(array.data[i].name, nullptr);
-        EXPECT_EQ(array.data[i].value, nullptr);
+    // Catches elements of a new block left with stale pointers, or a move that loses a
+    // field, from the heap or from an arena.
+    BlockArena arena;
+    for (bool inArena : {false, true}) {
+        SCOPED_TRACE(inArena ? "arena" : "heap");
+        ValueArray<Pair> array;
+        Pair first;
+        first.name = "n";
+        first.hash = 110;
+        first.value = "v";
+        if (inArena) {
+            array.Reserve(1, arena);
+            array.Add(first, arena);
+            array.Add(array.data[0], arena);  // steps to 8, from its own element
+        } else {
+            array.Reserve(1);
+            array.Add(first);
+            array.Add(array.data[0]);
+        }
+        ASSERT_EQ(array.capacity, 8);
+        for (int i = 0; i < 2; ++i) {
+            EXPECT_STREQ(array.data[i].name, "n");
+            EXPECT_EQ(array.data[i].hash, 110u);
+            EXPECT_STREQ(array.data[i].value, "v");
+        }
+        for (int i = 2; i < array.capacity; ++i) {
+            EXPECT_EQ(array.data[i].name, nullptr);
+            EXPECT_EQ(array.data[i].value, nullptr);
+        }
+        if (inArena)
+            array.ForgetBlock();
     }
 }
 

@@ -1,5 +1,6 @@
 #include <cerrno>
 #include <cstring>
+#include <exception>
 #include <fstream>
 #include <iterator>
 
@@ -54,9 +55,17 @@ bool ReadFile(const std::string& path, std::string& bytes, std::string& error)
         error = "cannot open '" + path + "': " + std::strerror(errno);
         return false;
     }
-    bytes.assign(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    // A folder opens but fails on the first read, which the stream reports by
+    // throwing: that is one more unreadable file, not a crash.
+    errno = 0;
+    try {
+        bytes.assign(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    } catch (const std::exception&) {
+        in.setstate(std::ios::badbit);
+    }
     if (in.bad()) {
-        error = "cannot read '" + path + "'";
+        error = "cannot read '" + path + "'" + (errno != 0 ? std::string(": ") + std::strerror(errno) : std::string());
+        bytes.clear();
         return false;
     }
     return true;

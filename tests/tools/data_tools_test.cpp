@@ -1,0 +1,295 @@
+// steamext data check / dump / scramble / unscramble, run as a game developer runs
+// them: the built program in a scratch folder, paths relative to it.
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+
+namespace {
+
+namespace fs = std::filesystem;
+using Json = nlohmann::json;
+
+struct Outcome {
+    int status = -1;
+    std::string out;
+    std::string err;
+};
+
+std::string Quote(const std::string& text)
+{
+    std::string quoted = "'";
+    for (const char c : text)
+        quoted += c == '\'' ? std::string("'\\''") : std::string(1, c);
+    return quoted + "'";
+}
+
+std::string ReadBytes(const fs::path& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+
+void WriteBytes(const fs::path& path, const std::string& bytes)
+{
+    std::ofstream(path, std::ios::binary | std::ios::trunc).write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+}
+
+std::vector<std::string> Lines(const std::string& text)
+{
+    std::vector<std::string> lines;
+    size_t start = 0;
+    for (size_t end; (end = text.find('\n', start)) != std::string::npos; start = end + 1)
+        lines.push_back(text.substr(start, end - start));
+    if (start < text.size())
+        lines.push_back(text.substr(start));
+    return lines;
+}
+
+// Each test gets a fresh folder to run in; stderr is kept beside it.
+class DataTools : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        static int serial = 0;
+        root_ = fs::temp_directory_path() / ("steamext_tools_" + std::to_string(getpid()) + "_" + std::to_string(++serial));
+        fs::remove_all(root_);
+        fs::create_directories(root_ / "w");
+    }
+    void TearDown() override { fs::remove_all(root_); }
+
+    fs::path Work() const { return root_ / "w"; }
+    void Put(const std::string& name, const std::string& bytes) const { WriteBytes(Work() / name, bytes); }
+
+    Outcome Run(const std::vector<std::string>& args) const
+    {
+        std::string command = "cd " + Quote(Work().string()) + " && " + Quote(STEAMEXT_PROGRAM);
+        for (const std::string& arg : args)
+            command += " " + Quote(arg);
+        command += " 2>" + Quote((root_ / "stderr").string());
+        Outcome outcome;
+        FILE* pipe = popen(command.c_str(), "r");
+        if (pipe == nullptr)
+            return outcome;
+        char buffer[4096];
+        for (size_t got; (got = fread(buffer, 1, sizeof buffer, pipe)) > 0;)
+            outcome.out.append(buffer, got);
+        const int raw = pclose(pipe);
+        outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+        outcome.err = ReadBytes(root_ / "stderr");
+        return outcome;
+    }
+
+    // A refusal: non-zero status, nothing on stdout, one line on stderr naming the fault.
+    void ExpectOneLineError(const Outcome& outcome, const std::string& fragment) const
+    {
+        EXPECT_NE(outcome.status, 0);
+        EXPECT_EQ(outcome.out, "");
+        EXPECT_EQ(Lines(outcome.err).size(), 1u) << outcome.err;
+        EXPECT_NE(outcome.err.find(fragment), std::string::npos) << outcome.err;
+        EXPECT_EQ(outcome.err.find("terminate called"), std::string::npos);
+    }
+
+private:
+    fs::path root_;
+};
+
+const std::string kDecl = "<?xml version=\"1.0\"?>\n";
+const std::string kGoodXml = kDecl +
+                             "<root>\n <array id=\"A\" k=\"v\">\n  <node id=\"n1\" x=\"caf\xe9\">text</node>\n"
+                             "  <node y=\"2\"/>\n </array>\n</root>\n";
+// A name without '=': the parse error's character is 0, so printf's text stops there.
+const std::string kCaseOneXml = kDecl + "<root><a b>\n</root>\n";
+
+TEST_F(DataTools, DumpPrintsTreeMessagesAndPopups)
+{
+    // Catches a wrong JSON shape, bytes above 127 not mapped to U+0080-U+00FF,
+    // reports not cut at their zero byte, and popups answered out of order or
+    // past the given answers.
+    const std::string caseOne =
+        "Parsing error (Reading next block (case #1)) around line 2 in XML 'bad.xml'. Unexpected character '";
+    const std::string m2 = "DataManager: XML database needs to end with root block closing. 'bad.xml' is invalid.";
+    const std::string popup = "CANCEL_TRY_CONTINUE,Failed to load XML file 'bad.xml'.";
+    struct Row {
+        const char* name;
+        std::string file;
+        std::string bytes;
+        std::vector<std::string> answers;
+        Json expected;
+    };
+    const Row rows[] = {
+        {"loaded xml", "good.xml", kGoodXml, {}, Json::parse(R"({"path": "good.xml", "loaded": true,
+            "arrays": [{"name": "A", "values": [["k", "v"]], "nodes": [
+                {"id": "n1", "values": [["id", "n1"], ["x", "caf\u00e9"], ["DATA", "text"]]},
+                {"id": null, "values": [["y", "2"]]}]}],
+            "reports": [], "popups": [], "logs": []})")},
+        {"csv with a null value", "t.csv", "a;b\n1\n", {}, Json::parse(R"({"path": "t.csv", "loaded": true,
+            "arrays": [{"name": null, "values": [], "nodes": [{"id": null, "values": [["a", "1"], ["b", null]]}]}],
+            "reports": [], "popups": [], "logs": [["info", "1 CSV Arrays loaded with total 1 nodes."]]})")},
+        {"high bytes in path and message", "d\xe9.xml", "\xe9<", {}, Json::parse(R"({"path": "d\u00e9.xml",
+            "loaded": false, "arrays": [],
+            "reports": [[1, "First non-whitespace char in XML document needs to be '<'. First char in 'd\u00e9.xml' is #233 '\u00e9'."]],
+            "popups": ["CANCEL_TRY_CONTINUE,Failed to load XML file 'd\u00e9.xml'."], "logs": []})")},
+        {"unknown ending", "notes.txt", "x", {}, Json::parse(R"({"path": "notes.txt", "loaded": false, "arrays": [],
+            "reports": [[1, "Unknown database file type 'notes.txt'. Supported formats are: .csv .xml"]],
+            "popups": [], "logs": []})")},
+        {"answers run out, then null", "bad.xml", kCaseOneXml, {"TRY_AGAIN"},
+         {{"path", "bad.xml"}, {"loaded", false}, {"arrays", Json::array()},
+          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}}, {"popups", Json::array({popup, popup})}, {"logs", Json::array()}}},
+        {"answers used in order, other case gives up", "bad.xml", kCaseOneXml, {"TRY_AGAIN", "try_again", "TRY_AGAIN"},
+         {{"path", "bad.xml"}, {"loaded", false}, {"arrays", Json::array()},
+          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}}, {"popups", Json::array({popup, popup})}, {"logs", Json::array()}}},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        Put(row.file, row.bytes);
+        std::vector<std::string> args = {"data", "dump", row.file};
+        for (const std::string& answer : row.answers) {
+            args.push_back("--popup-answer");
+            args.push_back(answer);
+        }
+        const Outcome outcome = Run(args);
+        EXPECT_EQ(outcome.status, 0);
+        EXPECT_EQ(outcome.err, "");
+        const Json dump = Json::parse(outcome.out, nullptr, false);
+        ASSERT_FALSE(dump.is_discarded()) << outcome.out;
+        EXPECT_EQ(dump, row.expected);
+    }
+}
+
+TEST_F(DataTools, DumpKeepsTheKeyOrder)
+{
+    // Catches keys printed in another order than the documented shape.
+    Put("good.xml", kGoodXml);
+    const Outcome outcome = Run({"data", "dump", "good.xml"});
+    const nlohmann::ordered_json dump = nlohmann::ordered_json::parse(outcome.out);
+    std::vector<std::string> keys;
+    for (const auto& item : dump.items())
+        keys.push_back(item.key());
+    EXPECT_EQ(keys, (std::vector<std::string>{"path", "loaded", "arrays", "reports", "popups", "logs"}));
+    std::vector<std::string> arrayKeys;
+    for (const auto& item : dump["arrays"][0].items())
+        arrayKeys.push_back(item.key());
+    EXPECT_EQ(arrayKeys, (std::vector<std::string>{"name", "values", "nodes"}));
+}
+
+TEST_F(DataTools, CheckPrintsMessagesThenVerdicts)
+{
+    // Catches a failed load that does not set the exit status, messages out of
+    // order with their popup, and verdicts that miscount.
+    Put("good.xml", kGoodXml);
+    Put("t.csv", "a;b\n1;2\n3;4\n");
+    Put("bad.xml", kDecl + "<root>\n");
+    const std::vector<std::string> goodLines = {"good.xml: ok (1 arrays, 2 nodes)",
+                                                "LogInfo: 1 CSV Arrays loaded with total 2 nodes.",
+                                                "t.csv: ok (1 arrays, 2 nodes)"};
+    const Outcome good = Run({"data", "check", "good.xml", "t.csv"});
+    EXPECT_EQ(good.status, 0);
+    EXPECT_EQ(Lines(good.out), goodLines);
+
+    const Outcome mixed = Run({"data", "check", "bad.xml", "good.xml"});
+    EXPECT_EQ(mixed.status, 1);
+    EXPECT_EQ(Lines(mixed.out),
+              (std::vector<std::string>{
+                  "ReportError(1): DataManager: XML database needs to end with root block closing. 'bad.xml' is invalid.",
+                  "ShowPopup: CANCEL_TRY_CONTINUE,Failed to load XML file 'bad.xml'.", "bad.xml: FAILED to load",
+                  "good.xml: ok (1 arrays, 2 nodes)"}));
+}
+
+TEST_F(DataTools, ScrambleRoundTripLoadsAsThePlainFile)
+{
+    // Catches a writer that is not the reader's inverse: a wrong checksum, key or
+    // index wrap, or header layout makes the module refuse the file.
+    std::string every;
+    for (int i = 0; i < 600; ++i)
+        every.push_back(static_cast<char>(i * 7));
+    Put("every.bin", every);
+    ASSERT_EQ(Run({"data", "scramble", "every.bin", "every.dat"}).status, 0);
+    const std::string envelope = ReadBytes(Work() / "every.dat");
+    ASSERT_EQ(envelope.size(), 22u + every.size());
+    EXPECT_EQ(envelope.substr(0, 14), std::string("MORVEN_STRATA\0", 14));
+    EXPECT_EQ(envelope.substr(14, 4), std::string("\x58\x02\x00\x00", 4));
+    EXPECT_NE(envelope.substr(22), every);
+    ASSERT_EQ(Run({"data", "unscramble", "every.dat", "every.out"}).status, 0);
+    EXPECT_EQ(ReadBytes(Work() / "every.out"), every);
+
+    // The module reads the envelope by content, whatever the name says.
+    Put("plain.xml", kGoodXml);
+    ASSERT_EQ(Run({"data", "scramble", "plain.xml", "wrapped.xml"}).status, 0);
+    Json plain = Json::parse(Run({"data", "dump", "plain.xml"}).out);
+    Json wrapped = Json::parse(Run({"data", "dump", "wrapped.xml"}).out);
+    EXPECT_TRUE(wrapped["loaded"].get<bool>());
+    EXPECT_EQ(wrapped["arrays"], plain["arrays"]);
+    EXPECT_EQ(wrapped["reports"], Json::array());
+}
+
+TEST_F(DataTools, UnscrambleRefusesBrokenEnvelopes)
+{
+    // Catches an envelope accepted with a wrong length or checksum, or a refusal
+    // that does not name its fault.
+    Put("plain.xml", kGoodXml);
+    ASSERT_EQ(Run({"data", "scramble", "plain.xml", "good.dat"}).status, 0);
+    const std::string good = ReadBytes(Work() / "good.dat");
+    std::string changed = good;
+    changed[22 + 5] = static_cast<char>(changed[22 + 5] ^ 1);
+    struct Row {
+        const char* name;
+        std::string bytes;
+        const char* fault;
+    };
+    const Row rows[] = {
+        {"one byte more", good + "x", "length"},
+        {"one byte less", good.substr(0, good.size() - 1), "length"},
+        {"changed payload byte", changed, "checksum"},
+        {"plain text", kGoodXml, "not a scrambled file"},
+        {"magic but too short", good.substr(0, 21), "not a scrambled file"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        Put("in.dat", row.bytes);
+        ExpectOneLineError(Run({"data", "unscramble", "in.dat", "out.xml"}), row.fault);
+        EXPECT_FALSE(fs::exists(Work() / "out.xml"));
+    }
+}
+
+TEST_F(DataTools, ErrorsAreOneLine)
+{
+    // Catches a crash or a multi-line usage dump on a missing or unreadable file
+    // or on bad arguments.
+    Put("in.xml", kGoodXml);
+    fs::create_directory(Work() / "folder.xml");
+    struct Row {
+        std::vector<std::string> args;
+        const char* fragment;
+    };
+    const Row rows[] = {
+        {{"data", "dump", "missing.xml"}, "missing.xml"},
+        {{"data", "check", "missing.xml"}, "missing.xml"},
+        {{"data", "dump", "folder.xml"}, "folder.xml"},
+        {{"data", "scramble", "missing.xml", "out.dat"}, "missing.xml"},
+        {{"data", "unscramble", "missing.dat", "out.xml"}, "missing.dat"},
+        {{"data", "scramble", "in.xml", "no/such/folder/out.dat"}, "no/such/folder/out.dat"},
+        {{"data"}, "steamext data"},
+        {{"data", "check"}, "steamext data check"},
+        {{"data", "dump", "in.xml", "in.xml"}, "steamext data dump"},
+        {{"data", "dump", "in.xml", "--popup-answer"}, "--popup-answer"},
+        {{"data", "scramble", "in.xml"}, "steamext data scramble"},
+    };
+    for (const Row& row : rows) {
+        std::string name;
+        for (const std::string& arg : row.args)
+            name += arg + " ";
+        SCOPED_TRACE(name);
+        ExpectOneLineError(Run(row.args), row.fragment);
+    }
+}
+
+} // namespace
