@@ -35,8 +35,9 @@ TEST(BlockArena, TextCopiesStayIntactAcrossChunks)
             const char* copy = round % 2 == 0 ? arena.CopyText(source.c_str(), &measured)
                                               : arena.CopyText(source.data(), source.size());
             ASSERT_NE(copy, nullptr);
-            if (round % 2 == 0)
+            if (round % 2 == 0) {
                 EXPECT_EQ(measured, length);
+            }
             EXPECT_NE(copy, source.c_str());
             copies.push_back(copy);
         }
