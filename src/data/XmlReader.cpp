@@ -36,6 +36,7 @@ enum : unsigned char {
     kNameFirst = 1 << 4,  // may start an attribute name
     kNameNext = 1 << 5,   // may follow in an attribute name
     kNameEnd = 1 << 6,    // ends an element name: terminator, space, '>'
+    kAfterValue = 1 << 7, // may follow a value's closing quote: '>', '?', '/', whitespace
 };
 
 struct CharClassTable {
@@ -63,10 +64,53 @@ struct CharClassTable {
             classes[c] |= kNameFirst | kNameNext;
         for (unsigned char c : {'\0', ' ', '>'})
             classes[c] |= kNameEnd;
+        for (unsigned char c : {'>', '?', '/', '\t', '\n', '\r', ' '})
+            classes[c] |= kAfterValue;
     }
 };
 
 constexpr CharClassTable kCharClasses;
+
+// Bytes that stop the walk over an attribute value in the token.
+enum : unsigned char {
+    kValueQuoted = 1 << 0, // between quotes: terminator, quote, backslash, '&'
+    kValueOpen = 1 << 1,   // outside them: those, space and '>'
+};
+
+struct ValueClassTable {
+    unsigned char classes[256];
+
+    constexpr ValueClassTable() : classes()
+    {
+        for (unsigned char c : {'\0', '"', '\\', '&'})
+            classes[c] |= kValueQuoted | kValueOpen;
+        for (unsigned char c : {' ', '>'})
+            classes[c] |= kValueOpen;
+    }
+};
+
+constexpr ValueClassTable kValueClasses;
+
+inline bool IsValue(unsigned char c, unsigned char mask)
+{
+    return (kValueClasses.classes[c] & mask) != 0;
+}
+
+// The first byte from `p` on of class `mask`. The terminator is of every class,
+// and no byte behind it is read.
+inline char* SkipValueBytes(char* p, unsigned char mask)
+{
+    for (;; p += 4) {
+        if (IsValue(static_cast<unsigned char>(p[0]), mask))
+            return p;
+        if (IsValue(static_cast<unsigned char>(p[1]), mask))
+            return p + 1;
+        if (IsValue(static_cast<unsigned char>(p[2]), mask))
+            return p + 2;
+        if (IsValue(static_cast<unsigned char>(p[3]), mask))
+            return p + 3;
+    }
+}
 
 inline bool Is(unsigned char c, unsigned char mask)
 {
@@ -90,6 +134,25 @@ inline int32_t ScanPlain(const unsigned char* text, int32_t pos, int32_t stop, u
     }
     while (pos < stop && !Is(text[pos], mask))
         ++pos;
+    return pos;
+}
+
+// Copies the bytes of [pos, stop) up to the first of class `mask` to `out`, and
+// returns that byte's index, or `stop`. Eight bytes are copied at a time, so up
+// to seven bytes behind the run may be written too, never beyond out + (stop - pos).
+inline int32_t CopyPlain(const unsigned char* text, int32_t pos, int32_t stop, unsigned char mask, char* out)
+{
+    while (pos + 8 <= stop) {
+        std::memcpy(out, text + pos, 8);
+        for (int32_t k = 0; k < 8; ++k) {
+            if (Is(text[pos + k], mask))
+                return pos + k;
+        }
+        pos += 8;
+        out += 8;
+    }
+    while (pos < stop && !Is(text[pos], mask))
+        *out++ = static_cast<char>(text[pos++]);
     return pos;
 }
 
@@ -154,23 +217,38 @@ void UndoEscapes(char* value)
     *write = '\0';
 }
 
-// Replaces each `entity` of `value` by `byte`, scanning on behind each replacement.
-void ReplaceAll(char* value, const char* entity, size_t entityLength, char byte)
+// Replaces "&quot;" by '"' and "&amp;" by '&', scanning on behind each
+// replacement. One pass does what a pass for each would, in that order: neither
+// entity can overlap the other, and a '"' put in can't start an "&amp;".
+void ReplaceQuotAndAmp(char* value)
 {
-    char* found = std::strstr(value, entity);
-    if (found == nullptr)
+    char* read = std::strchr(value, '&');
+    if (read == nullptr)
         return;
-    char* write = found;
-    const char* read = found;
-    while (*read != '\0') {
-        if (*read == '&' && std::strncmp(read, entity, entityLength) == 0) {
-            *write++ = byte;
-            read += entityLength;
+    char* write = read;
+    for (;;) {
+        // `read` is at a '&'.
+        if (std::strncmp(read, "&quot;", 6) == 0) {
+            *write++ = '"';
+            read += 6;
+        } else if (std::strncmp(read, "&amp;", 5) == 0) {
+            *write++ = '&';
+            read += 5;
         } else {
             *write++ = *read++;
         }
+        char* next = std::strchr(read, '&');
+        if (next == nullptr) {
+            const size_t rest = std::strlen(read);
+            std::memmove(write, read, rest + 1);
+            return;
+        }
+        const size_t run = static_cast<size_t>(next - read);
+        if (write != read)
+            std::memmove(write, read, run);
+        write += run;
+        read = next;
     }
-    *write = '\0';
 }
 
 } // namespace
@@ -372,14 +450,65 @@ char* XmlReader::ReadToken(XmlBlock& target)
     bool inQuotes = false;
 
     for (;;) {
+        // In a tag, the bytes whose pass is settled without the general steps
+        // below: plain bytes, whitespace, '=', quotes opened and quotes closed
+        // before an allowed byte. Each stores at most one byte, so runs are
+        // bounded by the room left. The loop leaves at the first byte that
+        // needs more, and behind a stored '-', which may complete "<!--".
+        while (inTag) {
+            const int32_t stop = std::min(end, pos + (kTokenLimit - n));
+            const unsigned char mask = inQuotes ? kQuoteStop : kTagStop;
+            if (!inQuotes && n > 0 && token[n - 1] == '-')
+                break;
+            const int32_t runEnd = CopyPlain(text, pos, stop, mask, token + n);
+            n += runEnd - pos;
+            pos = runEnd;
+            if (pos >= end) {
+                cursor = pos;
+                return nullptr;
+            }
+            if (pos == stop)
+                break;
+            const unsigned char c = text[pos];
+            if (inQuotes) {
+                if (c != '"')
+                    break;
+                const bool escaped = n >= 1 && token[n - 1] == '\\' && !(n >= 2 && token[n - 2] == '\\');
+                if (!escaped) {
+                    if (!Is(text[pos + 1], kAfterValue))
+                        break;
+                    inQuotes = false;
+                }
+                token[n++] = '"';
+            } else {
+                const char last = n > 0 ? token[n - 1] : '\0';
+                if (Is(c, kWhite)) {
+                    if (!(n == 0 || last == ' ' || last == '<' || last == '='))
+                        token[n++] = ' ';
+                } else if (c == '=') {
+                    if (last == ' ')
+                        --n;
+                    token[n++] = '=';
+                } else if (c == '"') {
+                    token[n++] = '"';
+                    inQuotes = true;
+                } else {
+                    break;
+                }
+            }
+            if (++pos >= end) {
+                cursor = pos;
+                return nullptr;
+            }
+        }
+
         // Fast paths. A byte dropped for want of room still ends its pass. The
         // copying loops are bounded by the room left, the dropping ones follow.
         const unsigned char mask = inQuotes ? kQuoteStop : inTag ? kTagStop : kTextStop;
         // A byte behind a stored '-' may complete "<!--": the slow path looks.
         if (!inTag || inQuotes || n == 0 || token[n - 1] != '-') {
             const int32_t stop = std::min(end, pos + (kTokenLimit - n));
-            const int32_t runEnd = ScanPlain(text, pos, stop, mask);
-            std::memcpy(token + n, text + pos, static_cast<size_t>(runEnd - pos));
+            const int32_t runEnd = CopyPlain(text, pos, stop, mask, token + n);
             n += runEnd - pos;
             pos = runEnd;
             if (pos == stop && pos < end && !Is(text[pos], mask)) {
@@ -602,27 +731,31 @@ XmlBlock* XmlReader::ReadAttributes(char* start)
 {
     for (;;) {
         // The name up to the next '=', tested on the way: a bad byte or no '='
-        // at all is the same refusal.
+        // at all is the same refusal, so the scan stops at the first byte that
+        // may not stand in a name and wants it to be the '='.
         char* attributeName = start;
         char* equals = start;
-        bool nameValid = true;
-        for (; *equals != '=' && *equals != '\0'; ++equals) {
-            if (nameValid && !Is(static_cast<unsigned char>(*equals), equals == attributeName ? kNameFirst : kNameNext))
-                nameValid = false;
+        if (Is(static_cast<unsigned char>(*equals), kNameFirst)) {
+            ++equals;
+            while (Is(static_cast<unsigned char>(*equals), kNameNext))
+                ++equals;
         }
-        if (*equals != '=' || !nameValid) {
+        if (*equals != '=') {
             ReportParseError("Reading next block (case #1)", 0);
             return nullptr;
         }
         *equals = '\0';
 
         // The value runs to a space or '>' outside quotes ("/>": to the '/').
+        // Between quotes only a quote or the terminator can end a run.
         char* const opening = equals + 1;
         char* end = opening;
         bool quoted = false;
         bool hasBackslash = false;
         bool hasAmpersand = false;
         for (;; ++end) {
+            const unsigned char mask = quoted ? kValueQuoted : kValueOpen;
+            end = SkipValueBytes(end, mask);
             const char c = *end;
             if (c == '\0')
                 break;
@@ -692,11 +825,10 @@ XmlBlock* XmlReader::ReadAttributes(char* start)
 
 void XmlReader::ReplaceEntities(char* value)
 {
-    if (value == nullptr || std::strchr(value, '&') == nullptr)
+    if (value == nullptr)
         return;
-    // Two passes, so "&amp;quot;" ends as the text "&quot;".
-    ReplaceAll(value, "&quot;", 6, '"');
-    ReplaceAll(value, "&amp;", 5, '&');
+    // "&amp;quot;" ends as the text "&quot;", as if "&quot;" went first.
+    ReplaceQuotAndAmp(value);
 }
 
 // ---------------------------------------------------------------------------
