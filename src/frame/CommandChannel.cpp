@@ -76,7 +76,7 @@ const char* OpenStoreWithAppId(const char* argument)
 
 const char* GetPlayerOnlineId()
 {
-    uint32 accountId = SteamUser() != nullptr ? SteamUser()->GetSteamID().GetAccountID() : 0;
+    uint32 accountId = LocalAccountId();
     FormatToBuffer(playerIdText, sizeof playerIdText, "%d", static_cast<int32_t>(accountId));
     return accountId != 0 ? playerIdText : nullptr;
 }
@@ -93,12 +93,7 @@ const char* GetServerTime()
 const char* UnlockAchievement(const char* argument)
 {
     InlineString name = TakeToken(argument, ",", 1);
-    if (name.text != nullptr && steamManager.initialised) {
-        if (SteamUserStats() != nullptr)
-            SteamUserStats()->SetAchievement(name.text);
-        if (steamAchievements != nullptr)
-            steamAchievements->unlockCounter = 0;
-    }
+    UnlockAchievementIfConnected(name.text);
     return "OK";  // whatever happened
 }
 

@@ -62,7 +62,7 @@ bool SteamManager::Start()
     if (SteamUserStats() != nullptr && SteamUser() != nullptr && SteamUser()->BLoggedOn())
         SteamUserStats()->RequestCurrentStats();
 
-    uint32 accountId = SteamUser() != nullptr ? SteamUser()->GetSteamID().GetAccountID() : 0;
+    uint32 accountId = LocalAccountId();
     FormatToBuffer(startupPlayerId, sizeof startupPlayerId, "%d", static_cast<int32_t>(accountId));
     PostStartupEvent(true);
     return true;
@@ -79,6 +79,11 @@ void SteamManager::PostStartupEvent(bool succeeded)
     event->PlayerId = succeeded ? startupPlayerId : nullptr;
     event->ErrorText = succeeded ? nullptr : kInitFailedText;
     hostServices->PostEvent(&record);
+}
+
+uint32 LocalAccountId()
+{
+    return SteamUser() != nullptr ? SteamUser()->GetSteamID().GetAccountID() : 0;
 }
 
 void SteamManager::OnOverlayActivated(GameOverlayActivated_t* param)

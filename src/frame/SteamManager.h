@@ -21,3 +21,6 @@ private:
 };
 
 extern SteamManager steamManager;
+
+// The low 32 bits of the local user's id; 0 without ISteamUser.
+uint32 LocalAccountId();

@@ -17,12 +17,7 @@ const char* AchievementImplementationSteam::GetPlatformName()
 
 void AchievementImplementationSteam::UnlockAchievement(int32_t /*reserved*/, const char* name)
 {
-    if (name == nullptr || !steamManager.initialised)
-        return;
-    if (SteamUserStats() != nullptr)
-        SteamUserStats()->SetAchievement(name);
-    if (steamAchievements != nullptr)
-        steamAchievements->unlockCounter = 0;
+    UnlockAchievementIfConnected(name);
 }
 
 void AchievementImplementationSteam::ReservedAction1() {}

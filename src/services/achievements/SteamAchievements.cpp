@@ -1,6 +1,7 @@
 #include "services/achievements/SteamAchievements.h"
 
 #include "foundation/TextFormat.h"
+#include "frame/SteamManager.h"
 #include "host/HostServices.h"
 
 SteamAchievements* steamAchievements = nullptr;
@@ -89,4 +90,14 @@ void SteamAchievements::OnUserAchievementStored(UserAchievementStored_t* param)
 {
     if (param->m_nGameID == appId)
         hostServices->Log(kHostLogInfo, "Stored Achievement for Steam");
+}
+
+void UnlockAchievementIfConnected(const char* name)
+{
+    if (name == nullptr || !steamManager.initialised)
+        return;
+    if (SteamUserStats() != nullptr)
+        SteamUserStats()->SetAchievement(name);
+    if (steamAchievements != nullptr)
+        steamAchievements->unlockCounter = 0;
 }

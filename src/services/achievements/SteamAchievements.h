@@ -35,3 +35,7 @@ private:
 
 // The one instance while the connection is up; null otherwise.
 extern SteamAchievements* steamAchievements;
+
+// Sets an achievement on the platform while connected; null names are ignored.
+// Nothing is stored here: the updater thread stores.
+void UnlockAchievementIfConnected(const char* name);
