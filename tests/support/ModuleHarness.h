@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "frame/ExtensionModule.h"
-#include "simclient/world.h"
+#include "simclient/World.h"
 #include "simengine/Engine.h"
 #include "simengine/ModuleLoader.h"
 

@@ -12,7 +12,7 @@
 #include <map>
 #include <thread>
 
-#include <simclient/world.h>
+#include <simclient/World.h>
 
 #include "frame/ExtensionModule.h"
 #include "run/EngineSession.h"

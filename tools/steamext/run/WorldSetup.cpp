@@ -1,6 +1,6 @@
 #include "run/WorldSetup.h"
 
-#include <simclient/world.h>
+#include <simclient/World.h>
 
 namespace steamext::run {
 

@@ -5,7 +5,7 @@
 #include <gtest/gtest.h>
 #include <steam/steam_api.h>
 
-#include "simclient/world.h"
+#include "simclient/World.h"
 
 class SimWorld : public ::testing::Test {
  protected:

@@ -1,5 +1,5 @@
 // Leaderboard ranking/upload rules and the workshop item round trip.
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

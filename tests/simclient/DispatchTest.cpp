@@ -2,7 +2,7 @@
 // against handlers that change registrations.
 #include <memory>
 
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

@@ -16,7 +16,7 @@
 #include <string>
 #include <vector>
 
-#include "simclient/world.h"
+#include "simclient/World.h"
 
 namespace simclient {
 

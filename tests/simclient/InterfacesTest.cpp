@@ -1,7 +1,7 @@
 // Interface lookup through the inline accessors, and the small per-interface behaviours.
 #include <cstring>
 
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

@@ -1,5 +1,5 @@
 // CCallback / CCallResult semantics as the module relies on them.
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

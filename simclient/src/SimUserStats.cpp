@@ -2,10 +2,10 @@
 // where they are configured per app; float accessors share the int32 values.
 #include <cstring>
 
-#include "args.h"
-#include "sim_interfaces.h"
-#include "sim_user_stats.h"
-#include "world_state.h"
+#include "Args.h"
+#include "SimInterfaces.h"
+#include "SimUserStats.h"
+#include "WorldState.h"
 
 namespace simclient {
 namespace {

@@ -1,4 +1,4 @@
-#include "simclient/journal.h"
+#include "simclient/Journal.h"
 
 namespace simclient {
 

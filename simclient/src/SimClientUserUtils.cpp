@@ -1,7 +1,7 @@
 // ISteamClient, ISteamUser and ISteamUtils: identity, clock, overlay, warning hook.
-#include "args.h"
-#include "sim_interfaces.h"
-#include "world_state.h"
+#include "Args.h"
+#include "SimInterfaces.h"
+#include "WorldState.h"
 
 namespace simclient {
 namespace {

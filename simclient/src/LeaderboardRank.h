@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-#include "world_state.h"
+#include "WorldState.h"
 
 namespace simclient {
 

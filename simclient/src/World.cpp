@@ -1,8 +1,8 @@
 // The control API: every member takes the world lock for the duration of its own work.
-#include "simclient/world.h"
+#include "simclient/World.h"
 
-#include "leaderboard_rank.h"
-#include "world_state.h"
+#include "LeaderboardRank.h"
+#include "WorldState.h"
 
 namespace simclient {
 

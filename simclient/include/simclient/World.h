@@ -14,8 +14,8 @@
 
 #include <steam/steam_api.h>
 
-#include "simclient/fault.h"
-#include "simclient/journal.h"
+#include "simclient/Fault.h"
+#include "simclient/Journal.h"
 
 namespace simclient {
 

@@ -8,7 +8,7 @@ namespace simclient {
 
 class SimSteamUserStats final : public ISteamUserStats {
  public:
-  // sim_user_stats.cpp
+  // SimUserStats.cpp
   bool RequestCurrentStats() override;
   bool GetStat(const char* pchName, int32* pData) override;
   bool GetStat(const char* pchName, float* pData) override;
@@ -17,7 +17,7 @@ class SimSteamUserStats final : public ISteamUserStats {
   bool SetAchievement(const char* pchName) override;
   bool StoreStats() override;
 
-  // sim_leaderboards.cpp
+  // SimLeaderboards.cpp
   SteamAPICall_t FindOrCreateLeaderboard(const char* pchLeaderboardName,
                                          ELeaderboardSortMethod eLeaderboardSortMethod,
                                          ELeaderboardDisplayType eLeaderboardDisplayType) override;

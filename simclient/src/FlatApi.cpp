@@ -1,10 +1,10 @@
 // The exported flat functions: start-up, shut-down, pump, registration, interface lookup.
 #include <cstring>
 
-#include "args.h"
-#include "callback_mgr.h"
-#include "sim_interfaces.h"
-#include "world_state.h"
+#include "Args.h"
+#include "CallbackManager.h"
+#include "SimInterfaces.h"
+#include "WorldState.h"
 
 using namespace simclient;
 

@@ -3,10 +3,10 @@
 #include <algorithm>
 #include <cstring>
 
-#include "args.h"
-#include "leaderboard_rank.h"
-#include "sim_user_stats.h"
-#include "world_state.h"
+#include "Args.h"
+#include "LeaderboardRank.h"
+#include "SimUserStats.h"
+#include "WorldState.h"
 
 namespace simclient {
 namespace {

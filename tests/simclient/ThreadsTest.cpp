@@ -5,7 +5,7 @@
 #include <thread>
 #include <vector>
 
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

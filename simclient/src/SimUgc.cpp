@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cstring>
 
-#include "args.h"
-#include "sim_interfaces.h"
-#include "world_state.h"
+#include "Args.h"
+#include "SimInterfaces.h"
+#include "WorldState.h"
 
 namespace simclient {
 namespace {

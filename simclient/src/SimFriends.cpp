@@ -1,7 +1,7 @@
 // ISteamFriends: persona names and the overlay requests (recorded, never shown).
-#include "args.h"
-#include "sim_interfaces.h"
-#include "world_state.h"
+#include "Args.h"
+#include "SimInterfaces.h"
+#include "WorldState.h"
 
 namespace simclient {
 namespace {

@@ -1,7 +1,7 @@
 // Fault injection reaches every kind of failure path; the journal records calls in order.
 #include <cstring>
 
-#include "sim_fixture.h"
+#include "SimFixture.h"
 
 namespace {
 

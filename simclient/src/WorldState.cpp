@@ -1,4 +1,4 @@
-#include "world_state.h"
+#include "WorldState.h"
 
 #include <algorithm>
 #include <cstring>

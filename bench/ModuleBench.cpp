@@ -8,7 +8,7 @@
 
 #include "frame/ExtensionModule.h"
 #include "host/HostServices.h"
-#include "simclient/world.h"
+#include "simclient/World.h"
 #include "simengine/Engine.h"
 #include "simengine/ModuleLoader.h"
 

@@ -6,13 +6,13 @@
 //                lock, check it is still registered, unlock, Run(p)
 // Handlers may register, unregister or destroy callback objects (their own or others')
 // and may issue new calls; those land at a later pump.
-#include "callback_mgr.h"
+#include "CallbackManager.h"
 
 #include <algorithm>
 #include <vector>
 
-#include "args.h"
-#include "world_state.h"
+#include "Args.h"
+#include "WorldState.h"
 
 using simclient::Args;
 using simclient::Pending;
