@@ -43,15 +43,24 @@ int64_t FileRead(void* destination, int64_t count, HostFile* record)
     return taken;
 }
 
-int64_t FileTell(HostFile* record) { return static_cast<MemoryFile*>(record->handle)->position; }
+int64_t FileTell(HostFile* record)
+{
+    return static_cast<MemoryFile*>(record->handle)->position;
+}
 int32_t FileSeek(HostFile* record, int64_t position, int32_t)
 {
     static_cast<MemoryFile*>(record->handle)->position = position;
     return 0;
 }
-void FileClose(HostFile* record) { delete static_cast<MemoryFile*>(record->handle); }
+void FileClose(HostFile* record)
+{
+    delete static_cast<MemoryFile*>(record->handle);
+}
 void ReportError(int32_t, const char*, ...) {}
-const char* HostCommand(const char*, const char*) { return nullptr; }
+const char* HostCommand(const char*, const char*)
+{
+    return nullptr;
+}
 
 void InstallTable(const std::string& file)
 {
@@ -165,7 +174,7 @@ void PugiXml(benchmark::State& state)
     Label(state, file);
 }
 
-} // namespace
+}  // namespace
 
 // 0: 4 KB, 1: 1 MB, 2: 32 MB.
 BENCHMARK(Ours)->DenseRange(0, 2)->Unit(benchmark::kMicrosecond);

@@ -99,4 +99,4 @@ inline void Install(const uint8_t* data, size_t size)
     hostServices = &table;
 }
 
-} // namespace fuzzhost
+}  // namespace fuzzhost

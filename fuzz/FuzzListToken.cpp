@@ -15,7 +15,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
     if (size < 3 + separatorLength)
         return 0;
     const std::string separator(reinterpret_cast<const char*>(data + 3), separatorLength);
-    const std::string list(reinterpret_cast<const char*>(data + 3 + separatorLength), size - 3 - separatorLength);
+    const std::string list(reinterpret_cast<const char*>(data + 3 + separatorLength),
+                           size - 3 - separatorLength);
     std::vector<char> buffer(static_cast<size_t>(bufferSize) + 1, '\x7f');
     GetListToken(buffer.data(), bufferSize, list.c_str(), separator.c_str(), index);
     // Nothing may be written past the size given.

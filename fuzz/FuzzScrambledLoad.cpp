@@ -16,7 +16,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
     } else {
         file.resize(envelope::kHeaderSize + size);
         std::copy(envelope::kMagic, envelope::kMagic + envelope::kMagicSize, file.begin());
-        const uint32_t sum = envelope::Scramble(data, static_cast<int32_t>(size), file.data() + envelope::kHeaderSize);
+        const uint32_t sum =
+            envelope::Scramble(data, static_cast<int32_t>(size), file.data() + envelope::kHeaderSize);
         for (int i = 0; i < 4; ++i) {
             file[14 + i] = static_cast<uint8_t>(size >> (8 * i));
             file[18 + i] = static_cast<uint8_t>(sum >> (8 * i));

@@ -5,13 +5,13 @@
 #include "steam_api_common.h"
 
 class ISteamApps {
- public:
-  virtual const char* GetCurrentGameLanguage() = 0;
-  virtual bool BIsDlcInstalled(AppId_t appID) = 0;
-  virtual int GetDLCCount() = 0;
-  virtual bool BGetDLCDataByIndex(int iDLC, AppId_t* pAppID, bool* pbAvailable, char* pchName,
-                                  int cchNameBufferSize) = 0;
-  virtual bool GetCurrentBetaName(char* pchName, int cchNameBufferSize) = 0;
+public:
+    virtual const char* GetCurrentGameLanguage() = 0;
+    virtual bool BIsDlcInstalled(AppId_t appID) = 0;
+    virtual int GetDLCCount() = 0;
+    virtual bool BGetDLCDataByIndex(int iDLC, AppId_t* pAppID, bool* pbAvailable, char* pchName,
+                                    int cchNameBufferSize) = 0;
+    virtual bool GetCurrentBetaName(char* pchName, int cchNameBufferSize) = 0;
 };
 
 #define STEAMAPPS_INTERFACE_VERSION "STEAMAPPS_INTERFACE_VERSION008"

@@ -5,14 +5,14 @@
 #include "steam_api_common.h"
 
 class ISteamClient {
- public:
-  virtual void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) = 0;
+public:
+    virtual void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) = 0;
 };
 
 #define STEAMCLIENT_INTERFACE_VERSION "SteamClient020"
 
 STEAM_DEFINE_INTERFACE_ACCESSOR(ISteamClient*, SteamClient,
-                                SteamInternal_CreateInterface(STEAMCLIENT_INTERFACE_VERSION),
-                                "global", STEAMCLIENT_INTERFACE_VERSION)
+                                SteamInternal_CreateInterface(STEAMCLIENT_INTERFACE_VERSION), "global",
+                                STEAMCLIENT_INTERFACE_VERSION)
 
 #endif  // ISTEAMCLIENT_H

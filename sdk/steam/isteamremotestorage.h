@@ -19,31 +19,31 @@ const uint32 k_cchFilenameMax = 260;
 const uint32 k_cchPublishedFileURLMax = 256;
 
 enum ERemoteStoragePublishedFileVisibility {
-  k_ERemoteStoragePublishedFileVisibilityPublic = 0,
-  k_ERemoteStoragePublishedFileVisibilityFriendsOnly = 1,
-  k_ERemoteStoragePublishedFileVisibilityPrivate = 2,
-  k_ERemoteStoragePublishedFileVisibilityUnlisted = 3,
+    k_ERemoteStoragePublishedFileVisibilityPublic = 0,
+    k_ERemoteStoragePublishedFileVisibilityFriendsOnly = 1,
+    k_ERemoteStoragePublishedFileVisibilityPrivate = 2,
+    k_ERemoteStoragePublishedFileVisibilityUnlisted = 3,
 };
 
 enum EWorkshopFileType {
-  k_EWorkshopFileTypeFirst = 0,
-  k_EWorkshopFileTypeCommunity = 0,
-  k_EWorkshopFileTypeMicrotransaction = 1,
-  k_EWorkshopFileTypeCollection = 2,
-  k_EWorkshopFileTypeArt = 3,
-  k_EWorkshopFileTypeVideo = 4,
-  k_EWorkshopFileTypeScreenshot = 5,
-  k_EWorkshopFileTypeGame = 6,
-  k_EWorkshopFileTypeSoftware = 7,
-  k_EWorkshopFileTypeConcept = 8,
-  k_EWorkshopFileTypeWebGuide = 9,
-  k_EWorkshopFileTypeIntegratedGuide = 10,
-  k_EWorkshopFileTypeMerch = 11,
-  k_EWorkshopFileTypeControllerBinding = 12,
-  k_EWorkshopFileTypeSteamworksAccessInvite = 13,
-  k_EWorkshopFileTypeSteamVideo = 14,
-  k_EWorkshopFileTypeGameManagedItem = 15,
-  k_EWorkshopFileTypeMax = 16
+    k_EWorkshopFileTypeFirst = 0,
+    k_EWorkshopFileTypeCommunity = 0,
+    k_EWorkshopFileTypeMicrotransaction = 1,
+    k_EWorkshopFileTypeCollection = 2,
+    k_EWorkshopFileTypeArt = 3,
+    k_EWorkshopFileTypeVideo = 4,
+    k_EWorkshopFileTypeScreenshot = 5,
+    k_EWorkshopFileTypeGame = 6,
+    k_EWorkshopFileTypeSoftware = 7,
+    k_EWorkshopFileTypeConcept = 8,
+    k_EWorkshopFileTypeWebGuide = 9,
+    k_EWorkshopFileTypeIntegratedGuide = 10,
+    k_EWorkshopFileTypeMerch = 11,
+    k_EWorkshopFileTypeControllerBinding = 12,
+    k_EWorkshopFileTypeSteamworksAccessInvite = 13,
+    k_EWorkshopFileTypeSteamVideo = 14,
+    k_EWorkshopFileTypeGameManagedItem = 15,
+    k_EWorkshopFileTypeMax = 16
 };
 
 #if defined(VALVE_CALLBACK_PACK_SMALL)
@@ -53,32 +53,36 @@ enum EWorkshopFileType {
 #endif
 
 struct SteamParamStringArray_t {
-  const char** m_ppStrings;
-  int32 m_nNumStrings;
+    const char** m_ppStrings;
+    int32 m_nNumStrings;
 };
 
 struct RemoteStorageSubscribePublishedFileResult_t {
-  enum { k_iCallback = k_iClientRemoteStorageCallbacks + 13 };
-  EResult m_eResult;
-  PublishedFileId_t m_nPublishedFileId;
+    enum {
+        k_iCallback = k_iClientRemoteStorageCallbacks + 13
+    };
+    EResult m_eResult;
+    PublishedFileId_t m_nPublishedFileId;
 };
 
 struct RemoteStorageUnsubscribePublishedFileResult_t {
-  enum { k_iCallback = k_iClientRemoteStorageCallbacks + 15 };
-  EResult m_eResult;
-  PublishedFileId_t m_nPublishedFileId;
+    enum {
+        k_iCallback = k_iClientRemoteStorageCallbacks + 15
+    };
+    EResult m_eResult;
+    PublishedFileId_t m_nPublishedFileId;
 };
 
 #pragma pack(pop)
 
 class ISteamRemoteStorage {
- public:
-  virtual bool FileWrite(const char* pchFile, const void* pvData, int32 cubData) = 0;
-  virtual int32 FileRead(const char* pchFile, void* pvData, int32 cubDataToRead) = 0;
-  virtual bool FileDelete(const char* pchFile) = 0;
-  virtual bool FileExists(const char* pchFile) = 0;
-  virtual int32 GetFileSize(const char* pchFile) = 0;
-  virtual void SetCloudEnabledForApp(bool bEnabled) = 0;
+public:
+    virtual bool FileWrite(const char* pchFile, const void* pvData, int32 cubData) = 0;
+    virtual int32 FileRead(const char* pchFile, void* pvData, int32 cubDataToRead) = 0;
+    virtual bool FileDelete(const char* pchFile) = 0;
+    virtual bool FileExists(const char* pchFile) = 0;
+    virtual int32 GetFileSize(const char* pchFile) = 0;
+    virtual void SetCloudEnabledForApp(bool bEnabled) = 0;
 };
 
 #define STEAMREMOTESTORAGE_INTERFACE_VERSION "STEAMREMOTESTORAGE_INTERFACE_VERSION016"

@@ -5,9 +5,9 @@
 #include "steam_api_common.h"
 
 class ISteamUser {
- public:
-  virtual bool BLoggedOn() = 0;
-  virtual CSteamID GetSteamID() = 0;
+public:
+    virtual bool BLoggedOn() = 0;
+    virtual CSteamID GetSteamID() = 0;
 };
 
 #define STEAMUSER_INTERFACE_VERSION "SteamUser021"

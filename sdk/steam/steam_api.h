@@ -4,14 +4,14 @@
 
 #include "steam_api_common.h"
 
-#include "isteamclient.h"
-#include "isteamuser.h"
-#include "isteamfriends.h"
-#include "isteamutils.h"
-#include "isteamuserstats.h"
 #include "isteamapps.h"
+#include "isteamclient.h"
+#include "isteamfriends.h"
 #include "isteamremotestorage.h"
 #include "isteamugc.h"
+#include "isteamuser.h"
+#include "isteamuserstats.h"
+#include "isteamutils.h"
 
 // True when the client is running and every interface could be created.
 S_API bool S_CALLTYPE SteamAPI_Init();

@@ -5,8 +5,8 @@
 
 #include <stddef.h>
 
-#include "steamtypes.h"
 #include "steamclientpublic.h"
+#include "steamtypes.h"
 
 #if defined(_WIN32)
 #define S_CALLTYPE __cdecl
@@ -21,8 +21,7 @@
 #endif
 
 // Severity 0 is a message, 1 a warning.
-extern "C" typedef void(S_CALLTYPE* SteamAPIWarningMessageHook_t)(int nSeverity,
-                                                                  const char* pchDebugText);
+extern "C" typedef void(S_CALLTYPE* SteamAPIWarningMessageHook_t)(int nSeverity, const char* pchDebugText);
 
 // Delivers every queued callback and completed call result on the calling thread.
 S_API void S_CALLTYPE SteamAPI_RunCallbacks();

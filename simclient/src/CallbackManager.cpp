@@ -21,19 +21,24 @@ using simclient::WorldState;
 
 namespace {
 
-bool IsRegisteredFor(const WorldState& s, CCallbackBase* cb, int id) {
-  auto found = s.callbacks.find(id);
-  if (found == s.callbacks.end()) return false;
-  const auto& list = found->second;
-  return std::find(list.begin(), list.end(), cb) != list.end();
+bool IsRegisteredFor(const WorldState& s, CCallbackBase* cb, int id)
+{
+    auto found = s.callbacks.find(id);
+    if (found == s.callbacks.end())
+        return false;
+    const auto& list = found->second;
+    return std::find(list.begin(), list.end(), cb) != list.end();
 }
 
-void RemoveFrom(WorldState& s, CCallbackBase* cb, int id) {
-  auto found = s.callbacks.find(id);
-  if (found == s.callbacks.end()) return;
-  auto& list = found->second;
-  list.erase(std::remove(list.begin(), list.end(), cb), list.end());
-  if (list.empty()) s.callbacks.erase(found);
+void RemoveFrom(WorldState& s, CCallbackBase* cb, int id)
+{
+    auto found = s.callbacks.find(id);
+    if (found == s.callbacks.end())
+        return;
+    auto& list = found->second;
+    list.erase(std::remove(list.begin(), list.end(), cb), list.end());
+    if (list.empty())
+        s.callbacks.erase(found);
 }
 
 // Nested pumps from inside a handler do nothing, as with the real client.
@@ -41,104 +46,120 @@ thread_local bool t_dispatching = false;
 
 }  // namespace
 
-void CCallbackMgr::Register(CCallbackBase* cb, int callbackId) {
-  WorldState& s = State();
-  std::lock_guard<std::mutex> lock(s.mutex);
-  s.Record("SteamAPI_RegisterCallback", Args(callbackId));
-  if (!cb) return;
-  if (cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered)
-    RemoveFrom(s, cb, cb->m_iCallback);
-  cb->m_nCallbackFlags |= CCallbackBase::k_ECallbackFlagsRegistered;
-  cb->m_iCallback = callbackId;
-  s.callbacks[callbackId].push_back(cb);
-}
-
-void CCallbackMgr::Unregister(CCallbackBase* cb) {
-  WorldState& s = State();
-  std::lock_guard<std::mutex> lock(s.mutex);
-  s.Record("SteamAPI_UnregisterCallback", Args(cb ? cb->m_iCallback : 0));
-  if (!cb || !(cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered)) return;
-  RemoveFrom(s, cb, cb->m_iCallback);
-  cb->m_nCallbackFlags &= ~CCallbackBase::k_ECallbackFlagsRegistered;
-}
-
-void CCallbackMgr::RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle) {
-  WorldState& s = State();
-  std::lock_guard<std::mutex> lock(s.mutex);
-  s.Record("SteamAPI_RegisterCallResult", Args(handle));
-  if (!cb || handle == k_uAPICallInvalid) return;
-  s.callResults[handle] = cb;
-}
-
-void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle) {
-  WorldState& s = State();
-  std::lock_guard<std::mutex> lock(s.mutex);
-  s.Record("SteamAPI_UnregisterCallResult", Args(handle));
-  auto found = s.callResults.find(handle);
-  if (found != s.callResults.end() && found->second == cb) s.callResults.erase(found);
-}
-
-void CCallbackMgr::RunCallbacks() {
-  WorldState& s = State();
-  // Idle fast path: with the journal off and nothing queued, a pump has nothing to do
-  // (no pending item depends on the pump count while the queue is empty).
-  if (!s.journalEnabled.load(std::memory_order_relaxed) &&
-      s.queuedCount.load(std::memory_order_acquire) == 0)
-    return;
-  std::vector<Pending> due;
-  {
+void CCallbackMgr::Register(CCallbackBase* cb, int callbackId)
+{
+    WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
-    s.Record("SteamAPI_RunCallbacks", "");
-    if (t_dispatching || !s.initialised) return;
-    ++s.pump;
-    for (auto it = s.queue.begin(); it != s.queue.end();) {
-      if (it->dueAtPump <= s.pump) {
-        due.push_back(std::move(*it));
-        it = s.queue.erase(it);
-      } else {
-        ++it;
-      }
-    }
-    s.SyncQueuedCount();
-  }
-  t_dispatching = true;
-  for (Pending& item : due) {
-    if (item.handle != k_uAPICallInvalid) {
-      CCallbackBase* target = nullptr;
-      {
-        std::lock_guard<std::mutex> lock(s.mutex);
-        if (item.onDeliver) item.onDeliver();
-        auto found = s.callResults.find(item.handle);
-        if (found != s.callResults.end()) {
-          target = found->second;
-          s.callResults.erase(found);  // the dispatcher, not the object, drops the binding
-        }
-      }
-      if (!target) continue;
-      std::vector<uint8> buffer(item.payload);
-      buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
-      target->Run(buffer.data(), item.ioFailure, item.handle);
-      continue;
-    }
-    std::vector<CCallbackBase*> targets;
+    s.Record("SteamAPI_RegisterCallback", Args(callbackId));
+    if (!cb)
+        return;
+    if (cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered)
+        RemoveFrom(s, cb, cb->m_iCallback);
+    cb->m_nCallbackFlags |= CCallbackBase::k_ECallbackFlagsRegistered;
+    cb->m_iCallback = callbackId;
+    s.callbacks[callbackId].push_back(cb);
+}
+
+void CCallbackMgr::Unregister(CCallbackBase* cb)
+{
+    WorldState& s = State();
+    std::lock_guard<std::mutex> lock(s.mutex);
+    s.Record("SteamAPI_UnregisterCallback", Args(cb ? cb->m_iCallback : 0));
+    if (!cb || !(cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered))
+        return;
+    RemoveFrom(s, cb, cb->m_iCallback);
+    cb->m_nCallbackFlags &= ~CCallbackBase::k_ECallbackFlagsRegistered;
+}
+
+void CCallbackMgr::RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle)
+{
+    WorldState& s = State();
+    std::lock_guard<std::mutex> lock(s.mutex);
+    s.Record("SteamAPI_RegisterCallResult", Args(handle));
+    if (!cb || handle == k_uAPICallInvalid)
+        return;
+    s.callResults[handle] = cb;
+}
+
+void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle)
+{
+    WorldState& s = State();
+    std::lock_guard<std::mutex> lock(s.mutex);
+    s.Record("SteamAPI_UnregisterCallResult", Args(handle));
+    auto found = s.callResults.find(handle);
+    if (found != s.callResults.end() && found->second == cb)
+        s.callResults.erase(found);
+}
+
+void CCallbackMgr::RunCallbacks()
+{
+    WorldState& s = State();
+    // Idle fast path: with the journal off and nothing queued, a pump has nothing to do
+    // (no pending item depends on the pump count while the queue is empty).
+    if (!s.journalEnabled.load(std::memory_order_relaxed) &&
+        s.queuedCount.load(std::memory_order_acquire) == 0)
+        return;
+    std::vector<Pending> due;
     {
-      std::lock_guard<std::mutex> lock(s.mutex);
-      if (item.onDeliver) item.onDeliver();
-      auto found = s.callbacks.find(item.callbackId);
-      if (found != s.callbacks.end()) targets = found->second;
-    }
-    for (CCallbackBase* target : targets) {
-      {
         std::lock_guard<std::mutex> lock(s.mutex);
-        // Skip objects a previous handler unregistered (or destroyed), and game-server
-        // objects: everything here comes from the client pipe.
-        if (!IsRegisteredFor(s, target, item.callbackId)) continue;
-        if (target->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsGameServer) continue;
-      }
-      std::vector<uint8> buffer(item.payload);
-      buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
-      target->Run(buffer.data());
+        s.Record("SteamAPI_RunCallbacks", "");
+        if (t_dispatching || !s.initialised)
+            return;
+        ++s.pump;
+        for (auto it = s.queue.begin(); it != s.queue.end();) {
+            if (it->dueAtPump <= s.pump) {
+                due.push_back(std::move(*it));
+                it = s.queue.erase(it);
+            } else {
+                ++it;
+            }
+        }
+        s.SyncQueuedCount();
     }
-  }
-  t_dispatching = false;
+    t_dispatching = true;
+    for (Pending& item : due) {
+        if (item.handle != k_uAPICallInvalid) {
+            CCallbackBase* target = nullptr;
+            {
+                std::lock_guard<std::mutex> lock(s.mutex);
+                if (item.onDeliver)
+                    item.onDeliver();
+                auto found = s.callResults.find(item.handle);
+                if (found != s.callResults.end()) {
+                    target = found->second;
+                    s.callResults.erase(found);  // the dispatcher, not the object, drops the binding
+                }
+            }
+            if (!target)
+                continue;
+            std::vector<uint8> buffer(item.payload);
+            buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
+            target->Run(buffer.data(), item.ioFailure, item.handle);
+            continue;
+        }
+        std::vector<CCallbackBase*> targets;
+        {
+            std::lock_guard<std::mutex> lock(s.mutex);
+            if (item.onDeliver)
+                item.onDeliver();
+            auto found = s.callbacks.find(item.callbackId);
+            if (found != s.callbacks.end())
+                targets = found->second;
+        }
+        for (CCallbackBase* target : targets) {
+            {
+                std::lock_guard<std::mutex> lock(s.mutex);
+                // Skip objects a previous handler unregistered (or destroyed), and game-server
+                // objects: everything here comes from the client pipe.
+                if (!IsRegisteredFor(s, target, item.callbackId))
+                    continue;
+                if (target->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsGameServer)
+                    continue;
+            }
+            std::vector<uint8> buffer(item.payload);
+            buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
+            target->Run(buffer.data());
+        }
+    }
+    t_dispatching = false;
 }

@@ -6,12 +6,12 @@
 #include <steam/steam_api.h>
 
 class CCallbackMgr {
- public:
-  static void Register(CCallbackBase* cb, int callbackId);
-  static void Unregister(CCallbackBase* cb);
-  static void RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle);
-  static void UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle);
-  static void RunCallbacks();
+public:
+    static void Register(CCallbackBase* cb, int callbackId);
+    static void Unregister(CCallbackBase* cb);
+    static void RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle);
+    static void UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle);
+    static void RunCallbacks();
 };
 
 #endif  // SIMCLIENT_CALLBACK_MGR_H

@@ -14,9 +14,9 @@ constexpr HSteamUser kUser = 1;
 constexpr HSteamPipe kPipe = 1;
 
 struct VersionedInterface {
-  const char* version;
-  Interface which;
-  void* (*get)();
+    const char* version;
+    Interface which;
+    void* (*get)();
 };
 
 const VersionedInterface kUserInterfaces[] = {
@@ -24,8 +24,7 @@ const VersionedInterface kUserInterfaces[] = {
     {STEAMUTILS_INTERFACE_VERSION, Interface::Utils, [] { return (void*)SimUtils(); }},
     {STEAMAPPS_INTERFACE_VERSION, Interface::Apps, [] { return (void*)SimApps(); }},
     {STEAMFRIENDS_INTERFACE_VERSION, Interface::Friends, [] { return (void*)SimFriends(); }},
-    {STEAMUSERSTATS_INTERFACE_VERSION, Interface::UserStats,
-     [] { return (void*)SimUserStats(); }},
+    {STEAMUSERSTATS_INTERFACE_VERSION, Interface::UserStats, [] { return (void*)SimUserStats(); }},
     {STEAMREMOTESTORAGE_INTERFACE_VERSION, Interface::RemoteStorage,
      [] { return (void*)SimRemoteStorage(); }},
     {STEAMUGC_INTERFACE_VERSION, Interface::UGC, [] { return (void*)SimUGC(); }},
@@ -36,86 +35,102 @@ std::mutex g_contextMutex;
 
 }  // namespace
 
-S_API bool S_CALLTYPE SteamAPI_Init() {
-  CallScope call("SteamAPI_Init", "");
-  if (!call.state.initSucceeds || call.faults.fail) return false;
-  call.state.initialised = true;
-  call.state.BumpGeneration();
-  return true;
+S_API bool S_CALLTYPE SteamAPI_Init()
+{
+    CallScope call("SteamAPI_Init", "");
+    if (!call.state.initSucceeds || call.faults.fail)
+        return false;
+    call.state.initialised = true;
+    call.state.BumpGeneration();
+    return true;
 }
 
-S_API void S_CALLTYPE SteamAPI_Shutdown() {
-  CallScope call("SteamAPI_Shutdown", "");
-  call.state.initialised = false;
-  call.state.queue.clear();
-  call.state.SyncQueuedCount();  // results of calls in flight are lost with the connection
-  call.state.BumpGeneration();
+S_API void S_CALLTYPE SteamAPI_Shutdown()
+{
+    CallScope call("SteamAPI_Shutdown", "");
+    call.state.initialised = false;
+    call.state.queue.clear();
+    call.state.SyncQueuedCount();  // results of calls in flight are lost with the connection
+    call.state.BumpGeneration();
 }
 
-S_API bool S_CALLTYPE SteamAPI_IsSteamRunning() {
-  CallScope call("SteamAPI_IsSteamRunning", "");
-  return call.state.steamRunning && !call.faults.fail;
+S_API bool S_CALLTYPE SteamAPI_IsSteamRunning()
+{
+    CallScope call("SteamAPI_IsSteamRunning", "");
+    return call.state.steamRunning && !call.faults.fail;
 }
 
-S_API void S_CALLTYPE SteamAPI_RunCallbacks() { CCallbackMgr::RunCallbacks(); }
-
-S_API void S_CALLTYPE SteamAPI_RegisterCallback(CCallbackBase* pCallback, int iCallback) {
-  CCallbackMgr::Register(pCallback, iCallback);
+S_API void S_CALLTYPE SteamAPI_RunCallbacks()
+{
+    CCallbackMgr::RunCallbacks();
 }
 
-S_API void S_CALLTYPE SteamAPI_UnregisterCallback(CCallbackBase* pCallback) {
-  CCallbackMgr::Unregister(pCallback);
+S_API void S_CALLTYPE SteamAPI_RegisterCallback(CCallbackBase* pCallback, int iCallback)
+{
+    CCallbackMgr::Register(pCallback, iCallback);
 }
 
-S_API void S_CALLTYPE SteamAPI_RegisterCallResult(CCallbackBase* pCallback,
-                                                  SteamAPICall_t hAPICall) {
-  CCallbackMgr::RegisterCallResult(pCallback, hAPICall);
+S_API void S_CALLTYPE SteamAPI_UnregisterCallback(CCallbackBase* pCallback)
+{
+    CCallbackMgr::Unregister(pCallback);
 }
 
-S_API void S_CALLTYPE SteamAPI_UnregisterCallResult(CCallbackBase* pCallback,
-                                                    SteamAPICall_t hAPICall) {
-  CCallbackMgr::UnregisterCallResult(pCallback, hAPICall);
+S_API void S_CALLTYPE SteamAPI_RegisterCallResult(CCallbackBase* pCallback, SteamAPICall_t hAPICall)
+{
+    CCallbackMgr::RegisterCallResult(pCallback, hAPICall);
+}
+
+S_API void S_CALLTYPE SteamAPI_UnregisterCallResult(CCallbackBase* pCallback, SteamAPICall_t hAPICall)
+{
+    CCallbackMgr::UnregisterCallResult(pCallback, hAPICall);
 }
 
 // Accessor plumbing below is not journaled: it runs at every SteamX() use.
-S_API HSteamUser SteamAPI_GetHSteamUser() {
-  std::lock_guard<std::mutex> lock(State().mutex);
-  return State().initialised ? kUser : 0;
-}
-
-S_API HSteamPipe SteamAPI_GetHSteamPipe() {
-  std::lock_guard<std::mutex> lock(State().mutex);
-  return State().initialised ? kPipe : 0;
-}
-
-S_API void* S_CALLTYPE SteamInternal_ContextInit(void* pContextInitData) {
-  uintptr_t* ctx = static_cast<uintptr_t*>(pContextInitData);
-  std::lock_guard<std::mutex> lock(g_contextMutex);
-  uintptr_t generation = State().generation.load(std::memory_order_acquire);
-  if (ctx[1] != generation) {
-    // The init helper calls back into the lookup functions, which take the world lock;
-    // this one is a different mutex, so that is fine.
-    auto init = reinterpret_cast<void (*)(void*)>(ctx[0]);
-    init(&ctx[2]);
-    ctx[1] = generation;
-  }
-  return &ctx[2];
-}
-
-S_API void* S_CALLTYPE SteamInternal_FindOrCreateUserInterface(HSteamUser hSteamUser,
-                                                               const char* pszVersion) {
-  (void)hSteamUser;  // one user only; utilities come with the literal 0
-  if (!pszVersion) return nullptr;
-  for (const VersionedInterface& entry : kUserInterfaces) {
-    if (std::strcmp(entry.version, pszVersion) != 0) continue;
+S_API HSteamUser SteamAPI_GetHSteamUser()
+{
     std::lock_guard<std::mutex> lock(State().mutex);
-    return State().Usable(entry.which) ? entry.get() : nullptr;
-  }
-  return nullptr;
+    return State().initialised ? kUser : 0;
 }
 
-S_API void* S_CALLTYPE SteamInternal_CreateInterface(const char* ver) {
-  if (!ver || std::strcmp(ver, STEAMCLIENT_INTERFACE_VERSION) != 0) return nullptr;
-  std::lock_guard<std::mutex> lock(State().mutex);
-  return State().Usable(Interface::Client) ? SimClient() : nullptr;
+S_API HSteamPipe SteamAPI_GetHSteamPipe()
+{
+    std::lock_guard<std::mutex> lock(State().mutex);
+    return State().initialised ? kPipe : 0;
+}
+
+S_API void* S_CALLTYPE SteamInternal_ContextInit(void* pContextInitData)
+{
+    uintptr_t* ctx = static_cast<uintptr_t*>(pContextInitData);
+    std::lock_guard<std::mutex> lock(g_contextMutex);
+    uintptr_t generation = State().generation.load(std::memory_order_acquire);
+    if (ctx[1] != generation) {
+        // The init helper calls back into the lookup functions, which take the world lock;
+        // this one is a different mutex, so that is fine.
+        auto init = reinterpret_cast<void (*)(void*)>(ctx[0]);
+        init(&ctx[2]);
+        ctx[1] = generation;
+    }
+    return &ctx[2];
+}
+
+S_API void* S_CALLTYPE SteamInternal_FindOrCreateUserInterface(HSteamUser hSteamUser, const char* pszVersion)
+{
+    (void)hSteamUser;  // one user only; utilities come with the literal 0
+    if (!pszVersion)
+        return nullptr;
+    for (const VersionedInterface& entry : kUserInterfaces) {
+        if (std::strcmp(entry.version, pszVersion) != 0)
+            continue;
+        std::lock_guard<std::mutex> lock(State().mutex);
+        return State().Usable(entry.which) ? entry.get() : nullptr;
+    }
+    return nullptr;
+}
+
+S_API void* S_CALLTYPE SteamInternal_CreateInterface(const char* ver)
+{
+    if (!ver || std::strcmp(ver, STEAMCLIENT_INTERFACE_VERSION) != 0)
+        return nullptr;
+    std::lock_guard<std::mutex> lock(State().mutex);
+    return State().Usable(Interface::Client) ? SimClient() : nullptr;
 }

@@ -7,62 +7,73 @@ namespace simclient {
 namespace {
 
 class SimSteamClient final : public ISteamClient {
- public:
-  void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override {
-    CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
-    call.state.warningHook = pFunction;
-  }
+public:
+    void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override
+    {
+        CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
+        call.state.warningHook = pFunction;
+    }
 };
 
 class SimSteamUser final : public ISteamUser {
- public:
-  bool BLoggedOn() override {
-    CallScope call("BLoggedOn", "");
-    return call.state.loggedOn && !call.faults.fail;
-  }
-  CSteamID GetSteamID() override {
-    CallScope call("GetSteamID", "");
-    return call.faults.fail ? CSteamID() : CSteamID(call.state.userId);
-  }
+public:
+    bool BLoggedOn() override
+    {
+        CallScope call("BLoggedOn", "");
+        return call.state.loggedOn && !call.faults.fail;
+    }
+    CSteamID GetSteamID() override
+    {
+        CallScope call("GetSteamID", "");
+        return call.faults.fail ? CSteamID() : CSteamID(call.state.userId);
+    }
 };
 
 class SimSteamUtils final : public ISteamUtils {
- public:
-  uint32 GetServerRealTime() override {
-    CallScope call("GetServerRealTime", "");
-    return call.faults.fail ? 0 : call.state.serverTime;
-  }
-  uint32 GetAppID() override {
-    CallScope call("GetAppID", "");
-    return call.faults.fail ? 0 : call.state.appId;
-  }
-  void SetOverlayNotificationPosition(ENotificationPosition position) override {
-    CallScope call("SetOverlayNotificationPosition", Args(position));
-    call.state.notificationPosition = position;
-  }
-  void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override {
-    CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
-    call.state.warningHook = pFunction;
-  }
-  bool IsOverlayEnabled() override {
-    CallScope call("IsOverlayEnabled", "");
-    return call.state.overlayEnabled && !call.faults.fail;
-  }
+public:
+    uint32 GetServerRealTime() override
+    {
+        CallScope call("GetServerRealTime", "");
+        return call.faults.fail ? 0 : call.state.serverTime;
+    }
+    uint32 GetAppID() override
+    {
+        CallScope call("GetAppID", "");
+        return call.faults.fail ? 0 : call.state.appId;
+    }
+    void SetOverlayNotificationPosition(ENotificationPosition position) override
+    {
+        CallScope call("SetOverlayNotificationPosition", Args(position));
+        call.state.notificationPosition = position;
+    }
+    void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override
+    {
+        CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
+        call.state.warningHook = pFunction;
+    }
+    bool IsOverlayEnabled() override
+    {
+        CallScope call("IsOverlayEnabled", "");
+        return call.state.overlayEnabled && !call.faults.fail;
+    }
 };
 
 }  // namespace
 
-ISteamClient* SimClient() {
-  static SimSteamClient instance;
-  return &instance;
+ISteamClient* SimClient()
+{
+    static SimSteamClient instance;
+    return &instance;
 }
-ISteamUser* SimUser() {
-  static SimSteamUser instance;
-  return &instance;
+ISteamUser* SimUser()
+{
+    static SimSteamUser instance;
+    return &instance;
 }
-ISteamUtils* SimUtils() {
-  static SimSteamUtils instance;
-  return &instance;
+ISteamUtils* SimUtils()
+{
+    static SimSteamUtils instance;
+    return &instance;
 }
 
 }  // namespace simclient

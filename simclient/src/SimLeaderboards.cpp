@@ -11,178 +11,189 @@
 namespace simclient {
 namespace {
 
-Leaderboard* BoardOf(WorldState& s, SteamLeaderboard_t handle) {
-  if (handle == 0 || handle > s.leaderboards.size()) return nullptr;
-  return &s.leaderboards[handle - 1];
+Leaderboard* BoardOf(WorldState& s, SteamLeaderboard_t handle)
+{
+    if (handle == 0 || handle > s.leaderboards.size())
+        return nullptr;
+    return &s.leaderboards[handle - 1];
 }
 
 // Stores a snapshot of the rows at `indices` as a downloaded-entries set, posts the result.
 SteamAPICall_t PostDownload(WorldState& s, const AppliedFaults& faults, Leaderboard* board,
-                            SteamLeaderboard_t handle, const std::vector<std::size_t>& indices) {
-  LeaderboardScoresDownloaded_t result{};
-  result.m_hSteamLeaderboard = handle;
-  bool failed = faults.fail || !board || (faults.result && *faults.result != k_EResultOK);
-  if (!failed) {
-    DownloadedEntries entries;
-    for (std::size_t i : indices) {
-      const LeaderboardRow& row = board->rows[i];
-      LeaderboardEntry_t entry{};
-      entry.m_steamIDUser = CSteamID(row.steamId);
-      entry.m_nGlobalRank = static_cast<int32>(i) + 1;
-      entry.m_nScore = row.score;
-      entry.m_cDetails = static_cast<int32>(row.details.size());
-      entry.m_hUGC = row.ugc;
-      entries.entries.push_back(entry);
-      entries.details.push_back(row.details);
+                            SteamLeaderboard_t handle, const std::vector<std::size_t>& indices)
+{
+    LeaderboardScoresDownloaded_t result{};
+    result.m_hSteamLeaderboard = handle;
+    bool failed = faults.fail || !board || (faults.result && *faults.result != k_EResultOK);
+    if (!failed) {
+        DownloadedEntries entries;
+        for (std::size_t i : indices) {
+            const LeaderboardRow& row = board->rows[i];
+            LeaderboardEntry_t entry{};
+            entry.m_steamIDUser = CSteamID(row.steamId);
+            entry.m_nGlobalRank = static_cast<int32>(i) + 1;
+            entry.m_nScore = row.score;
+            entry.m_cDetails = static_cast<int32>(row.details.size());
+            entry.m_hUGC = row.ugc;
+            entries.entries.push_back(entry);
+            entries.details.push_back(row.details);
+        }
+        result.m_hSteamLeaderboardEntries = s.nextEntriesHandle++;
+        result.m_cEntryCount = static_cast<int>(entries.entries.size());
+        s.downloads[result.m_hSteamLeaderboardEntries] = std::move(entries);
     }
-    result.m_hSteamLeaderboardEntries = s.nextEntriesHandle++;
-    result.m_cEntryCount = static_cast<int>(entries.entries.size());
-    s.downloads[result.m_hSteamLeaderboardEntries] = std::move(entries);
-  }
-  return QueueResult(s, result, faults);
+    return QueueResult(s, result, faults);
 }
 
 }  // namespace
 
 SteamAPICall_t SimSteamUserStats::FindOrCreateLeaderboard(const char* pchLeaderboardName,
                                                           ELeaderboardSortMethod sort,
-                                                          ELeaderboardDisplayType display) {
-  CallScope call("FindOrCreateLeaderboard", Args(pchLeaderboardName, sort, display));
-  WorldState& s = call.state;
-  if (!pchLeaderboardName || std::strlen(pchLeaderboardName) >= k_cchLeaderboardNameMax)
-    return k_uAPICallInvalid;
-  LeaderboardFindResult_t result{};
-  bool failed = call.faults.fail || (call.faults.result && *call.faults.result != k_EResultOK);
-  if (!failed) {
-    for (std::size_t i = 0; i < s.leaderboards.size(); ++i)
-      if (s.leaderboards[i].name == pchLeaderboardName) result.m_hSteamLeaderboard = i + 1;
-    // Creation needs a sort and a display type, as on the platform.
-    if (!result.m_hSteamLeaderboard && sort != k_ELeaderboardSortMethodNone &&
-        display != k_ELeaderboardDisplayTypeNone) {
-      Leaderboard board;
-      board.name = pchLeaderboardName;
-      board.sort = sort;
-      board.display = display;
-      s.leaderboards.push_back(board);
-      result.m_hSteamLeaderboard = s.leaderboards.size();
+                                                          ELeaderboardDisplayType display)
+{
+    CallScope call("FindOrCreateLeaderboard", Args(pchLeaderboardName, sort, display));
+    WorldState& s = call.state;
+    if (!pchLeaderboardName || std::strlen(pchLeaderboardName) >= k_cchLeaderboardNameMax)
+        return k_uAPICallInvalid;
+    LeaderboardFindResult_t result{};
+    bool failed = call.faults.fail || (call.faults.result && *call.faults.result != k_EResultOK);
+    if (!failed) {
+        for (std::size_t i = 0; i < s.leaderboards.size(); ++i)
+            if (s.leaderboards[i].name == pchLeaderboardName)
+                result.m_hSteamLeaderboard = i + 1;
+        // Creation needs a sort and a display type, as on the platform.
+        if (!result.m_hSteamLeaderboard && sort != k_ELeaderboardSortMethodNone &&
+            display != k_ELeaderboardDisplayTypeNone) {
+            Leaderboard board;
+            board.name = pchLeaderboardName;
+            board.sort = sort;
+            board.display = display;
+            s.leaderboards.push_back(board);
+            result.m_hSteamLeaderboard = s.leaderboards.size();
+        }
+        result.m_bLeaderboardFound = result.m_hSteamLeaderboard != 0;
     }
-    result.m_bLeaderboardFound = result.m_hSteamLeaderboard != 0;
-  }
-  return QueueResult(s, result, call.faults);
+    return QueueResult(s, result, call.faults);
 }
 
-const char* SimSteamUserStats::GetLeaderboardName(SteamLeaderboard_t hSteamLeaderboard) {
-  CallScope call("GetLeaderboardName", Args(hSteamLeaderboard));
-  Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
-  return board && !call.faults.fail ? board->name.c_str() : "";
+const char* SimSteamUserStats::GetLeaderboardName(SteamLeaderboard_t hSteamLeaderboard)
+{
+    CallScope call("GetLeaderboardName", Args(hSteamLeaderboard));
+    Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
+    return board && !call.faults.fail ? board->name.c_str() : "";
 }
 
-int SimSteamUserStats::GetLeaderboardEntryCount(SteamLeaderboard_t hSteamLeaderboard) {
-  CallScope call("GetLeaderboardEntryCount", Args(hSteamLeaderboard));
-  Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
-  return board && !call.faults.fail ? static_cast<int>(board->rows.size()) : 0;
+int SimSteamUserStats::GetLeaderboardEntryCount(SteamLeaderboard_t hSteamLeaderboard)
+{
+    CallScope call("GetLeaderboardEntryCount", Args(hSteamLeaderboard));
+    Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
+    return board && !call.faults.fail ? static_cast<int>(board->rows.size()) : 0;
 }
 
 SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntries(SteamLeaderboard_t handle,
-                                                             ELeaderboardDataRequest request,
-                                                             int start, int end) {
-  CallScope call("DownloadLeaderboardEntries", Args(handle, request, start, end));
-  WorldState& s = call.state;
-  Leaderboard* board = BoardOf(s, handle);
-  if (!board || request == k_ELeaderboardDataRequestUsers) return k_uAPICallInvalid;
-  std::vector<std::size_t> indices;
-  const int count = static_cast<int>(board->rows.size());
-  int first = 0, last = -1;  // 1-based, inclusive
-  if (request == k_ELeaderboardDataRequestGlobal) {
-    first = std::max(start, 1);
-    last = std::min(end, count);
-  } else if (request == k_ELeaderboardDataRequestGlobalAroundUser) {
-    int rank = RankOf(*board, s.userId);
-    if (rank > 0) {
-      first = std::max(rank + start, 1);
-      last = std::min(rank + end, count);
+                                                             ELeaderboardDataRequest request, int start,
+                                                             int end)
+{
+    CallScope call("DownloadLeaderboardEntries", Args(handle, request, start, end));
+    WorldState& s = call.state;
+    Leaderboard* board = BoardOf(s, handle);
+    if (!board || request == k_ELeaderboardDataRequestUsers)
+        return k_uAPICallInvalid;
+    std::vector<std::size_t> indices;
+    const int count = static_cast<int>(board->rows.size());
+    int first = 0, last = -1;  // 1-based, inclusive
+    if (request == k_ELeaderboardDataRequestGlobal) {
+        first = std::max(start, 1);
+        last = std::min(end, count);
+    } else if (request == k_ELeaderboardDataRequestGlobalAroundUser) {
+        int rank = RankOf(*board, s.userId);
+        if (rank > 0) {
+            first = std::max(rank + start, 1);
+            last = std::min(rank + end, count);
+        }
+    } else if (request == k_ELeaderboardDataRequestFriends) {
+        for (int i = 0; i < count; ++i) {
+            uint64 user = board->rows[static_cast<std::size_t>(i)].steamId;
+            if (user == s.userId || std::find(s.friends.begin(), s.friends.end(), user) != s.friends.end())
+                indices.push_back(static_cast<std::size_t>(i));
+        }
     }
-  } else if (request == k_ELeaderboardDataRequestFriends) {
-    for (int i = 0; i < count; ++i) {
-      uint64 user = board->rows[static_cast<std::size_t>(i)].steamId;
-      if (user == s.userId ||
-          std::find(s.friends.begin(), s.friends.end(), user) != s.friends.end())
-        indices.push_back(static_cast<std::size_t>(i));
-    }
-  }
-  for (int rank = first; rank >= 1 && rank <= last; ++rank)
-    indices.push_back(static_cast<std::size_t>(rank - 1));
-  return PostDownload(s, call.faults, board, handle, indices);
+    for (int rank = first; rank >= 1 && rank <= last; ++rank)
+        indices.push_back(static_cast<std::size_t>(rank - 1));
+    return PostDownload(s, call.faults, board, handle, indices);
 }
 
 SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntriesForUsers(SteamLeaderboard_t handle,
-                                                                     CSteamID* prgUsers,
-                                                                     int cUsers) {
-  CallScope call("DownloadLeaderboardEntriesForUsers", Args(handle, cUsers));
-  WorldState& s = call.state;
-  Leaderboard* board = BoardOf(s, handle);
-  if (!board || cUsers < 0 || cUsers > 100 || (cUsers > 0 && !prgUsers))
-    return k_uAPICallInvalid;
-  std::vector<std::size_t> indices;
-  for (std::size_t i = 0; i < board->rows.size(); ++i)
-    for (int u = 0; u < cUsers; ++u)
-      if (prgUsers[u].ConvertToUint64() == board->rows[i].steamId) {
-        indices.push_back(i);
-        break;
-      }
-  return PostDownload(s, call.faults, board, handle, indices);
+                                                                     CSteamID* prgUsers, int cUsers)
+{
+    CallScope call("DownloadLeaderboardEntriesForUsers", Args(handle, cUsers));
+    WorldState& s = call.state;
+    Leaderboard* board = BoardOf(s, handle);
+    if (!board || cUsers < 0 || cUsers > 100 || (cUsers > 0 && !prgUsers))
+        return k_uAPICallInvalid;
+    std::vector<std::size_t> indices;
+    for (std::size_t i = 0; i < board->rows.size(); ++i)
+        for (int u = 0; u < cUsers; ++u)
+            if (prgUsers[u].ConvertToUint64() == board->rows[i].steamId) {
+                indices.push_back(i);
+                break;
+            }
+    return PostDownload(s, call.faults, board, handle, indices);
 }
 
 bool SimSteamUserStats::GetDownloadedLeaderboardEntry(SteamLeaderboardEntries_t handle, int index,
                                                       LeaderboardEntry_t* pEntry, int32* pDetails,
-                                                      int cDetailsMax) {
-  CallScope call("GetDownloadedLeaderboardEntry", Args(handle, index, cDetailsMax));
-  auto found = call.state.downloads.find(handle);
-  if (call.faults.fail || found == call.state.downloads.end() || index < 0 ||
-      index >= static_cast<int>(found->second.entries.size()))
-    return false;
-  const auto i = static_cast<std::size_t>(index);
-  if (pEntry) *pEntry = found->second.entries[i];
-  const std::vector<int32>& details = found->second.details[i];
-  if (pDetails)
-    for (int d = 0; d < cDetailsMax && d < static_cast<int>(details.size()); ++d)
-      pDetails[d] = details[static_cast<std::size_t>(d)];
-  return true;
+                                                      int cDetailsMax)
+{
+    CallScope call("GetDownloadedLeaderboardEntry", Args(handle, index, cDetailsMax));
+    auto found = call.state.downloads.find(handle);
+    if (call.faults.fail || found == call.state.downloads.end() || index < 0 ||
+        index >= static_cast<int>(found->second.entries.size()))
+        return false;
+    const auto i = static_cast<std::size_t>(index);
+    if (pEntry)
+        *pEntry = found->second.entries[i];
+    const std::vector<int32>& details = found->second.details[i];
+    if (pDetails)
+        for (int d = 0; d < cDetailsMax && d < static_cast<int>(details.size()); ++d)
+            pDetails[d] = details[static_cast<std::size_t>(d)];
+    return true;
 }
 
 SteamAPICall_t SimSteamUserStats::UploadLeaderboardScore(SteamLeaderboard_t handle,
-                                                         ELeaderboardUploadScoreMethod method,
-                                                         int32 nScore, const int32* pScoreDetails,
-                                                         int cScoreDetailsCount) {
-  CallScope call("UploadLeaderboardScore",
-                 Args(handle, method, nScore, pScoreDetails, cScoreDetailsCount));
-  WorldState& s = call.state;
-  Leaderboard* board = BoardOf(s, handle);
-  if (!board || cScoreDetailsCount < 0 || cScoreDetailsCount > k_cLeaderboardDetailsMax)
-    return k_uAPICallInvalid;
-  LeaderboardScoreUploaded_t result{};
-  result.m_hSteamLeaderboard = handle;
-  result.m_nScore = nScore;
-  bool failed = call.faults.fail || (call.faults.result && *call.faults.result != k_EResultOK);
-  if (!failed) {
-    result.m_bSuccess = 1;
-    int previous = RankOf(*board, s.userId);
-    result.m_nGlobalRankPrevious = previous;
-    bool replace = previous == 0 || method == k_ELeaderboardUploadScoreMethodForceUpdate ||
-                   Better(board->sort, nScore, board->rows[previous - 1].score);
-    if (replace) {
-      if (previous) board->rows.erase(board->rows.begin() + (previous - 1));
-      LeaderboardRow row;
-      row.steamId = s.userId;
-      row.score = nScore;
-      if (pScoreDetails) row.details.assign(pScoreDetails, pScoreDetails + cScoreDetailsCount);
-      board->rows.push_back(row);
-      SortRows(*board);
-      result.m_bScoreChanged = 1;
+                                                         ELeaderboardUploadScoreMethod method, int32 nScore,
+                                                         const int32* pScoreDetails, int cScoreDetailsCount)
+{
+    CallScope call("UploadLeaderboardScore", Args(handle, method, nScore, pScoreDetails, cScoreDetailsCount));
+    WorldState& s = call.state;
+    Leaderboard* board = BoardOf(s, handle);
+    if (!board || cScoreDetailsCount < 0 || cScoreDetailsCount > k_cLeaderboardDetailsMax)
+        return k_uAPICallInvalid;
+    LeaderboardScoreUploaded_t result{};
+    result.m_hSteamLeaderboard = handle;
+    result.m_nScore = nScore;
+    bool failed = call.faults.fail || (call.faults.result && *call.faults.result != k_EResultOK);
+    if (!failed) {
+        result.m_bSuccess = 1;
+        int previous = RankOf(*board, s.userId);
+        result.m_nGlobalRankPrevious = previous;
+        bool replace = previous == 0 || method == k_ELeaderboardUploadScoreMethodForceUpdate ||
+                       Better(board->sort, nScore, board->rows[previous - 1].score);
+        if (replace) {
+            if (previous)
+                board->rows.erase(board->rows.begin() + (previous - 1));
+            LeaderboardRow row;
+            row.steamId = s.userId;
+            row.score = nScore;
+            if (pScoreDetails)
+                row.details.assign(pScoreDetails, pScoreDetails + cScoreDetailsCount);
+            board->rows.push_back(row);
+            SortRows(*board);
+            result.m_bScoreChanged = 1;
+        }
+        result.m_nGlobalRankNew = RankOf(*board, s.userId);
     }
-    result.m_nGlobalRankNew = RankOf(*board, s.userId);
-  }
-  return QueueResult(s, result, call.faults);
+    return QueueResult(s, result, call.faults);
 }
 
 }  // namespace simclient

@@ -10,283 +10,328 @@
 namespace simclient {
 namespace {
 
-template <std::size_t N>
-void CopyText(char (&out)[N], const std::string& text) {
-  std::size_t n = std::min(text.size(), N - 1);
-  std::memcpy(out, text.data(), n);
-  out[n] = '\0';
+template <std::size_t N> void CopyText(char (&out)[N], const std::string& text)
+{
+    std::size_t n = std::min(text.size(), N - 1);
+    std::memcpy(out, text.data(), n);
+    out[n] = '\0';
 }
 
-
-void SetSubscribed(WorkshopItem& item, bool subscribed) {
-  item.subscribed = subscribed;
-  if (subscribed)
-    item.state |= k_EItemStateSubscribed;
-  else
-    item.state &= ~uint32(k_EItemStateSubscribed);
+void SetSubscribed(WorkshopItem& item, bool subscribed)
+{
+    item.subscribed = subscribed;
+    if (subscribed)
+        item.state |= k_EItemStateSubscribed;
+    else
+        item.state &= ~uint32(k_EItemStateSubscribed);
 }
 
 class SimSteamUGC final : public ISteamUGC {
- public:
-  UGCQueryHandle_t CreateQueryUGCDetailsRequest(PublishedFileId_t* ids, uint32 count) override {
-    CallScope call("CreateQueryUGCDetailsRequest", Args(ids, count));
-    if (call.faults.fail || (count > 0 && !ids) || count > kNumUGCResultsPerPage)
-      return k_UGCQueryHandleInvalid;
-    UgcQuery query;
-    query.ids.assign(ids, ids + count);
-    UGCQueryHandle_t handle = call.state.nextQueryHandle++;
-    call.state.queries[handle] = std::move(query);
-    return handle;
-  }
-
-  SteamAPICall_t SendQueryUGCRequest(UGCQueryHandle_t handle) override {
-    CallScope call("SendQueryUGCRequest", Args(handle));
-    auto found = call.state.queries.find(handle);
-    if (found == call.state.queries.end() || found->second.sent) return k_uAPICallInvalid;
-    found->second.sent = true;
-    SteamUGCQueryCompleted_t result{};
-    result.m_handle = handle;
-    result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
-    if (result.m_eResult == k_EResultOK) {
-      found->second.completed = true;
-      result.m_unNumResultsReturned = static_cast<uint32>(found->second.ids.size());
-      result.m_unTotalMatchingResults = result.m_unNumResultsReturned;
+public:
+    UGCQueryHandle_t CreateQueryUGCDetailsRequest(PublishedFileId_t* ids, uint32 count) override
+    {
+        CallScope call("CreateQueryUGCDetailsRequest", Args(ids, count));
+        if (call.faults.fail || (count > 0 && !ids) || count > kNumUGCResultsPerPage)
+            return k_UGCQueryHandleInvalid;
+        UgcQuery query;
+        query.ids.assign(ids, ids + count);
+        UGCQueryHandle_t handle = call.state.nextQueryHandle++;
+        call.state.queries[handle] = std::move(query);
+        return handle;
     }
-    return QueueResult(call.state, result, call.faults);
-  }
 
-  bool GetQueryUGCResult(UGCQueryHandle_t handle, uint32 index,
-                         SteamUGCDetails_t* pDetails) override {
-    CallScope call("GetQueryUGCResult", Args(handle, index));
-    auto found = call.state.queries.find(handle);
-    if (call.faults.fail || !pDetails || found == call.state.queries.end() ||
-        !found->second.completed || index >= found->second.ids.size())
-      return false;
-    PublishedFileId_t id = found->second.ids[index];
-    std::memset(pDetails, 0, sizeof *pDetails);
-    pDetails->m_nPublishedFileId = id;
-    pDetails->m_hFile = pDetails->m_hPreviewFile = k_UGCHandleInvalid;
-    auto item = call.state.items.find(id);
-    if (item == call.state.items.end()) {
-      pDetails->m_eResult = k_EResultFileNotFound;
-      return true;
+    SteamAPICall_t SendQueryUGCRequest(UGCQueryHandle_t handle) override
+    {
+        CallScope call("SendQueryUGCRequest", Args(handle));
+        auto found = call.state.queries.find(handle);
+        if (found == call.state.queries.end() || found->second.sent)
+            return k_uAPICallInvalid;
+        found->second.sent = true;
+        SteamUGCQueryCompleted_t result{};
+        result.m_handle = handle;
+        result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
+        if (result.m_eResult == k_EResultOK) {
+            found->second.completed = true;
+            result.m_unNumResultsReturned = static_cast<uint32>(found->second.ids.size());
+            result.m_unTotalMatchingResults = result.m_unNumResultsReturned;
+        }
+        return QueueResult(call.state, result, call.faults);
     }
-    const WorkshopItem& w = item->second;
-    pDetails->m_eResult = w.result;
-    pDetails->m_eFileType = k_EWorkshopFileTypeCommunity;
-    pDetails->m_nCreatorAppID = pDetails->m_nConsumerAppID = call.state.appId;
-    CopyText(pDetails->m_rgchTitle, w.title);
-    CopyText(pDetails->m_rgchDescription, w.description);
-    CopyText(pDetails->m_rgchTags, w.tags);
-    pDetails->m_bTagsTruncated = w.tags.size() >= k_cchTagListMax;
-    pDetails->m_ulSteamIDOwner = w.owner;
-    pDetails->m_rtimeCreated = w.timeCreated;
-    pDetails->m_rtimeUpdated = w.timeUpdated;
-    pDetails->m_eVisibility = w.visibility;
-    pDetails->m_bAcceptedForUse = true;
-    pDetails->m_nFileSize = static_cast<int32>(w.bytesTotal);
-    return true;
-  }
 
-  bool ReleaseQueryUGCRequest(UGCQueryHandle_t handle) override {
-    CallScope call("ReleaseQueryUGCRequest", Args(handle));
-    return call.state.queries.erase(handle) > 0;
-  }
-
-  SteamAPICall_t CreateItem(AppId_t nConsumerAppId, EWorkshopFileType eFileType) override {
-    CallScope call("CreateItem", Args(nConsumerAppId, eFileType));
-    WorldState& s = call.state;
-    CreateItemResult_t result{};
-    result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
-    result.m_bUserNeedsToAcceptWorkshopLegalAgreement = s.needsLegalAgreement;
-    if (result.m_eResult == k_EResultOK) {
-      WorkshopItem item;
-      item.id = s.nextItemId++;
-      item.owner = s.userId;
-      item.visibility = k_ERemoteStoragePublishedFileVisibilityPrivate;
-      item.timeCreated = item.timeUpdated = s.serverTime;
-      result.m_nPublishedFileId = item.id;
-      s.items[item.id] = item;
+    bool GetQueryUGCResult(UGCQueryHandle_t handle, uint32 index, SteamUGCDetails_t* pDetails) override
+    {
+        CallScope call("GetQueryUGCResult", Args(handle, index));
+        auto found = call.state.queries.find(handle);
+        if (call.faults.fail || !pDetails || found == call.state.queries.end() || !found->second.completed ||
+            index >= found->second.ids.size())
+            return false;
+        PublishedFileId_t id = found->second.ids[index];
+        std::memset(pDetails, 0, sizeof *pDetails);
+        pDetails->m_nPublishedFileId = id;
+        pDetails->m_hFile = pDetails->m_hPreviewFile = k_UGCHandleInvalid;
+        auto item = call.state.items.find(id);
+        if (item == call.state.items.end()) {
+            pDetails->m_eResult = k_EResultFileNotFound;
+            return true;
+        }
+        const WorkshopItem& w = item->second;
+        pDetails->m_eResult = w.result;
+        pDetails->m_eFileType = k_EWorkshopFileTypeCommunity;
+        pDetails->m_nCreatorAppID = pDetails->m_nConsumerAppID = call.state.appId;
+        CopyText(pDetails->m_rgchTitle, w.title);
+        CopyText(pDetails->m_rgchDescription, w.description);
+        CopyText(pDetails->m_rgchTags, w.tags);
+        pDetails->m_bTagsTruncated = w.tags.size() >= k_cchTagListMax;
+        pDetails->m_ulSteamIDOwner = w.owner;
+        pDetails->m_rtimeCreated = w.timeCreated;
+        pDetails->m_rtimeUpdated = w.timeUpdated;
+        pDetails->m_eVisibility = w.visibility;
+        pDetails->m_bAcceptedForUse = true;
+        pDetails->m_nFileSize = static_cast<int32>(w.bytesTotal);
+        return true;
     }
-    return QueueResult(s, result, call.faults);
-  }
 
-  UGCUpdateHandle_t StartItemUpdate(AppId_t appId, PublishedFileId_t id) override {
-    CallScope call("StartItemUpdate", Args(appId, id));
-    if (call.faults.fail || id == k_PublishedFileIdInvalid) return k_UGCUpdateHandleInvalid;
-    UGCUpdateHandle_t handle = call.state.nextUpdateHandle++;
-    ItemUpdate& update = call.state.updates[handle];
-    update.pending.id = id;
-    update.pending.appId = appId;
-    return handle;
-  }
-
-  bool SetItemTitle(UGCUpdateHandle_t handle, const char* text) override {
-    return SetField("SetItemTitle", handle, text, &WorkshopSubmission::title);
-  }
-  bool SetItemDescription(UGCUpdateHandle_t handle, const char* text) override {
-    return SetField("SetItemDescription", handle, text, &WorkshopSubmission::description);
-  }
-  bool SetItemContent(UGCUpdateHandle_t handle, const char* folder) override {
-    return SetField("SetItemContent", handle, folder, &WorkshopSubmission::content);
-  }
-  bool SetItemPreview(UGCUpdateHandle_t handle, const char* file) override {
-    return SetField("SetItemPreview", handle, file, &WorkshopSubmission::preview);
-  }
-
-  bool SetItemVisibility(UGCUpdateHandle_t handle,
-                         ERemoteStoragePublishedFileVisibility visibility) override {
-    CallScope call("SetItemVisibility", Args(handle, visibility));
-    auto found = call.state.updates.find(handle);
-    if (call.faults.fail || found == call.state.updates.end()) return false;
-    found->second.pending.visibility = visibility;
-    return true;
-  }
-
-  bool SetItemTags(UGCUpdateHandle_t handle, const SteamParamStringArray_t* pTags) override {
-    std::string list;
-    if (pTags && pTags->m_ppStrings)
-      for (int32 i = 0; i < pTags->m_nNumStrings; ++i)
-        list += (i ? "," : "") + std::string(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
-    CallScope call("SetItemTags", Args(handle, list));
-    auto found = call.state.updates.find(handle);
-    if (call.faults.fail || !pTags || found == call.state.updates.end()) return false;
-    std::vector<std::string> tags;
-    for (int32 i = 0; pTags->m_ppStrings && i < pTags->m_nNumStrings; ++i)
-      tags.emplace_back(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
-    found->second.pending.tags = tags;
-    return true;
-  }
-
-  SteamAPICall_t SubmitItemUpdate(UGCUpdateHandle_t handle, const char* pchChangeNote) override {
-    CallScope call("SubmitItemUpdate", Args(handle, pchChangeNote));
-    WorldState& s = call.state;
-    auto found = s.updates.find(handle);
-    if (found == s.updates.end()) return k_uAPICallInvalid;
-    WorkshopSubmission submission = found->second.pending;
-    submission.changeNote = pchChangeNote ? pchChangeNote : "";
-    SubmitItemUpdateResult_t result{};
-    result.m_nPublishedFileId = submission.id;
-    result.m_bUserNeedsToAcceptWorkshopLegalAgreement = s.needsLegalAgreement;
-    result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
-    auto item = s.items.find(submission.id);
-    if (result.m_eResult == k_EResultOK && item == s.items.end())
-      result.m_eResult = k_EResultFileNotFound;
-    if (result.m_eResult == k_EResultOK) {
-      WorkshopItem& w = item->second;
-      if (submission.title) w.title = *submission.title;
-      if (submission.description) w.description = *submission.description;
-      if (submission.visibility) w.visibility = *submission.visibility;
-      if (submission.tags) {
-        w.tags.clear();
-        for (const std::string& tag : *submission.tags) w.tags += (w.tags.empty() ? "" : ",") + tag;
-      }
-      w.timeUpdated = s.serverTime;
+    bool ReleaseQueryUGCRequest(UGCQueryHandle_t handle) override
+    {
+        CallScope call("ReleaseQueryUGCRequest", Args(handle));
+        return call.state.queries.erase(handle) > 0;
     }
-    s.submissions.push_back(submission);
-    return QueueResult(s, result, call.faults);
-  }
 
-  EItemUpdateStatus GetItemUpdateProgress(UGCUpdateHandle_t handle, uint64* processed,
-                                          uint64* total) override {
-    CallScope call("GetItemUpdateProgress", Args(handle));
-    if (call.faults.fail || !call.state.updates.count(handle)) return k_EItemUpdateStatusInvalid;
-    if (processed) *processed = call.state.updateProcessed;
-    if (total) *total = call.state.updateTotal;
-    return call.state.updateStatus;
-  }
-
-  SteamAPICall_t SubscribeItem(PublishedFileId_t id) override {
-    return ChangeSubscription<RemoteStorageSubscribePublishedFileResult_t>("SubscribeItem", id,
-                                                                           true);
-  }
-  SteamAPICall_t UnsubscribeItem(PublishedFileId_t id) override {
-    return ChangeSubscription<RemoteStorageUnsubscribePublishedFileResult_t>("UnsubscribeItem",
-                                                                             id, false);
-  }
-
-  uint32 GetNumSubscribedItems() override {
-    CallScope call("GetNumSubscribedItems", "");
-    if (call.faults.fail) return 0;
-    uint32 n = 0;
-    for (const auto& entry : call.state.items) n += entry.second.subscribed ? 1 : 0;
-    return n;
-  }
-
-  uint32 GetSubscribedItems(PublishedFileId_t* ids, uint32 cMaxEntries) override {
-    CallScope call("GetSubscribedItems", Args(ids, cMaxEntries));
-    if (call.faults.fail || !ids) return 0;
-    uint32 n = 0;
-    for (const auto& entry : call.state.items)
-      if (entry.second.subscribed && n < cMaxEntries) ids[n++] = entry.first;
-    return n;
-  }
-
-  uint32 GetItemState(PublishedFileId_t id) override {
-    CallScope call("GetItemState", Args(id));
-    auto found = call.state.items.find(id);
-    if (call.faults.fail || found == call.state.items.end()) return k_EItemStateNone;
-    return found->second.state;
-  }
-
-  bool GetItemInstallInfo(PublishedFileId_t id, uint64* sizeOnDisk, char* folder,
-                          uint32 cchFolderSize, uint32* timeStamp) override {
-    CallScope call("GetItemInstallInfo", Args(id, cchFolderSize));
-    auto found = call.state.items.find(id);
-    if (call.faults.fail || found == call.state.items.end() ||
-        !(found->second.state & k_EItemStateInstalled))
-      return false;
-    const WorkshopItem& w = found->second;
-    if (sizeOnDisk) *sizeOnDisk = w.sizeOnDisk;
-    if (timeStamp) *timeStamp = w.installTimestamp;
-    if (folder && cchFolderSize > 0) {
-      std::size_t n = std::min<std::size_t>(w.folder.size(), cchFolderSize - 1);
-      std::memcpy(folder, w.folder.data(), n);
-      folder[n] = '\0';
+    SteamAPICall_t CreateItem(AppId_t nConsumerAppId, EWorkshopFileType eFileType) override
+    {
+        CallScope call("CreateItem", Args(nConsumerAppId, eFileType));
+        WorldState& s = call.state;
+        CreateItemResult_t result{};
+        result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
+        result.m_bUserNeedsToAcceptWorkshopLegalAgreement = s.needsLegalAgreement;
+        if (result.m_eResult == k_EResultOK) {
+            WorkshopItem item;
+            item.id = s.nextItemId++;
+            item.owner = s.userId;
+            item.visibility = k_ERemoteStoragePublishedFileVisibilityPrivate;
+            item.timeCreated = item.timeUpdated = s.serverTime;
+            result.m_nPublishedFileId = item.id;
+            s.items[item.id] = item;
+        }
+        return QueueResult(s, result, call.faults);
     }
-    return true;
-  }
 
-  bool GetItemDownloadInfo(PublishedFileId_t id, uint64* downloaded, uint64* total) override {
-    CallScope call("GetItemDownloadInfo", Args(id));
-    auto found = call.state.items.find(id);
-    if (call.faults.fail || found == call.state.items.end() || found->second.bytesTotal == 0)
-      return false;
-    if (downloaded) *downloaded = found->second.bytesDownloaded;
-    if (total) *total = found->second.bytesTotal;
-    return true;
-  }
+    UGCUpdateHandle_t StartItemUpdate(AppId_t appId, PublishedFileId_t id) override
+    {
+        CallScope call("StartItemUpdate", Args(appId, id));
+        if (call.faults.fail || id == k_PublishedFileIdInvalid)
+            return k_UGCUpdateHandleInvalid;
+        UGCUpdateHandle_t handle = call.state.nextUpdateHandle++;
+        ItemUpdate& update = call.state.updates[handle];
+        update.pending.id = id;
+        update.pending.appId = appId;
+        return handle;
+    }
 
- private:
-  bool SetField(const char* name, UGCUpdateHandle_t handle, const char* text,
-                std::optional<std::string> WorkshopSubmission::*field) {
-    CallScope call(name, Args(handle, text));
-    auto found = call.state.updates.find(handle);
-    if (call.faults.fail || !text || found == call.state.updates.end()) return false;
-    found->second.pending.*field = std::string(text);
-    return true;
-  }
+    bool SetItemTitle(UGCUpdateHandle_t handle, const char* text) override
+    {
+        return SetField("SetItemTitle", handle, text, &WorkshopSubmission::title);
+    }
+    bool SetItemDescription(UGCUpdateHandle_t handle, const char* text) override
+    {
+        return SetField("SetItemDescription", handle, text, &WorkshopSubmission::description);
+    }
+    bool SetItemContent(UGCUpdateHandle_t handle, const char* folder) override
+    {
+        return SetField("SetItemContent", handle, folder, &WorkshopSubmission::content);
+    }
+    bool SetItemPreview(UGCUpdateHandle_t handle, const char* file) override
+    {
+        return SetField("SetItemPreview", handle, file, &WorkshopSubmission::preview);
+    }
 
-  template <class Result>
-  SteamAPICall_t ChangeSubscription(const char* name, PublishedFileId_t id, bool subscribe) {
-    CallScope call(name, Args(id));
-    WorldState& s = call.state;
-    Result result{};
-    result.m_nPublishedFileId = id;
-    result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
-    auto item = s.items.find(id);
-    if (result.m_eResult == k_EResultOK && item == s.items.end())
-      result.m_eResult = k_EResultFileNotFound;
-    if (result.m_eResult == k_EResultOK) SetSubscribed(item->second, subscribe);
-    return QueueResult(s, result, call.faults);
-  }
+    bool SetItemVisibility(UGCUpdateHandle_t handle,
+                           ERemoteStoragePublishedFileVisibility visibility) override
+    {
+        CallScope call("SetItemVisibility", Args(handle, visibility));
+        auto found = call.state.updates.find(handle);
+        if (call.faults.fail || found == call.state.updates.end())
+            return false;
+        found->second.pending.visibility = visibility;
+        return true;
+    }
+
+    bool SetItemTags(UGCUpdateHandle_t handle, const SteamParamStringArray_t* pTags) override
+    {
+        std::string list;
+        if (pTags && pTags->m_ppStrings)
+            for (int32 i = 0; i < pTags->m_nNumStrings; ++i)
+                list += (i ? "," : "") + std::string(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
+        CallScope call("SetItemTags", Args(handle, list));
+        auto found = call.state.updates.find(handle);
+        if (call.faults.fail || !pTags || found == call.state.updates.end())
+            return false;
+        std::vector<std::string> tags;
+        for (int32 i = 0; pTags->m_ppStrings && i < pTags->m_nNumStrings; ++i)
+            tags.emplace_back(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
+        found->second.pending.tags = tags;
+        return true;
+    }
+
+    SteamAPICall_t SubmitItemUpdate(UGCUpdateHandle_t handle, const char* pchChangeNote) override
+    {
+        CallScope call("SubmitItemUpdate", Args(handle, pchChangeNote));
+        WorldState& s = call.state;
+        auto found = s.updates.find(handle);
+        if (found == s.updates.end())
+            return k_uAPICallInvalid;
+        WorkshopSubmission submission = found->second.pending;
+        submission.changeNote = pchChangeNote ? pchChangeNote : "";
+        SubmitItemUpdateResult_t result{};
+        result.m_nPublishedFileId = submission.id;
+        result.m_bUserNeedsToAcceptWorkshopLegalAgreement = s.needsLegalAgreement;
+        result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
+        auto item = s.items.find(submission.id);
+        if (result.m_eResult == k_EResultOK && item == s.items.end())
+            result.m_eResult = k_EResultFileNotFound;
+        if (result.m_eResult == k_EResultOK) {
+            WorkshopItem& w = item->second;
+            if (submission.title)
+                w.title = *submission.title;
+            if (submission.description)
+                w.description = *submission.description;
+            if (submission.visibility)
+                w.visibility = *submission.visibility;
+            if (submission.tags) {
+                w.tags.clear();
+                for (const std::string& tag : *submission.tags)
+                    w.tags += (w.tags.empty() ? "" : ",") + tag;
+            }
+            w.timeUpdated = s.serverTime;
+        }
+        s.submissions.push_back(submission);
+        return QueueResult(s, result, call.faults);
+    }
+
+    EItemUpdateStatus GetItemUpdateProgress(UGCUpdateHandle_t handle, uint64* processed,
+                                            uint64* total) override
+    {
+        CallScope call("GetItemUpdateProgress", Args(handle));
+        if (call.faults.fail || !call.state.updates.count(handle))
+            return k_EItemUpdateStatusInvalid;
+        if (processed)
+            *processed = call.state.updateProcessed;
+        if (total)
+            *total = call.state.updateTotal;
+        return call.state.updateStatus;
+    }
+
+    SteamAPICall_t SubscribeItem(PublishedFileId_t id) override
+    {
+        return ChangeSubscription<RemoteStorageSubscribePublishedFileResult_t>("SubscribeItem", id, true);
+    }
+    SteamAPICall_t UnsubscribeItem(PublishedFileId_t id) override
+    {
+        return ChangeSubscription<RemoteStorageUnsubscribePublishedFileResult_t>("UnsubscribeItem", id,
+                                                                                 false);
+    }
+
+    uint32 GetNumSubscribedItems() override
+    {
+        CallScope call("GetNumSubscribedItems", "");
+        if (call.faults.fail)
+            return 0;
+        uint32 n = 0;
+        for (const auto& entry : call.state.items)
+            n += entry.second.subscribed ? 1 : 0;
+        return n;
+    }
+
+    uint32 GetSubscribedItems(PublishedFileId_t* ids, uint32 cMaxEntries) override
+    {
+        CallScope call("GetSubscribedItems", Args(ids, cMaxEntries));
+        if (call.faults.fail || !ids)
+            return 0;
+        uint32 n = 0;
+        for (const auto& entry : call.state.items)
+            if (entry.second.subscribed && n < cMaxEntries)
+                ids[n++] = entry.first;
+        return n;
+    }
+
+    uint32 GetItemState(PublishedFileId_t id) override
+    {
+        CallScope call("GetItemState", Args(id));
+        auto found = call.state.items.find(id);
+        if (call.faults.fail || found == call.state.items.end())
+            return k_EItemStateNone;
+        return found->second.state;
+    }
+
+    bool GetItemInstallInfo(PublishedFileId_t id, uint64* sizeOnDisk, char* folder, uint32 cchFolderSize,
+                            uint32* timeStamp) override
+    {
+        CallScope call("GetItemInstallInfo", Args(id, cchFolderSize));
+        auto found = call.state.items.find(id);
+        if (call.faults.fail || found == call.state.items.end() ||
+            !(found->second.state & k_EItemStateInstalled))
+            return false;
+        const WorkshopItem& w = found->second;
+        if (sizeOnDisk)
+            *sizeOnDisk = w.sizeOnDisk;
+        if (timeStamp)
+            *timeStamp = w.installTimestamp;
+        if (folder && cchFolderSize > 0) {
+            std::size_t n = std::min<std::size_t>(w.folder.size(), cchFolderSize - 1);
+            std::memcpy(folder, w.folder.data(), n);
+            folder[n] = '\0';
+        }
+        return true;
+    }
+
+    bool GetItemDownloadInfo(PublishedFileId_t id, uint64* downloaded, uint64* total) override
+    {
+        CallScope call("GetItemDownloadInfo", Args(id));
+        auto found = call.state.items.find(id);
+        if (call.faults.fail || found == call.state.items.end() || found->second.bytesTotal == 0)
+            return false;
+        if (downloaded)
+            *downloaded = found->second.bytesDownloaded;
+        if (total)
+            *total = found->second.bytesTotal;
+        return true;
+    }
+
+private:
+    bool SetField(const char* name, UGCUpdateHandle_t handle, const char* text,
+                  std::optional<std::string> WorkshopSubmission::*field)
+    {
+        CallScope call(name, Args(handle, text));
+        auto found = call.state.updates.find(handle);
+        if (call.faults.fail || !text || found == call.state.updates.end())
+            return false;
+        found->second.pending.*field = std::string(text);
+        return true;
+    }
+
+    template <class Result>
+    SteamAPICall_t ChangeSubscription(const char* name, PublishedFileId_t id, bool subscribe)
+    {
+        CallScope call(name, Args(id));
+        WorldState& s = call.state;
+        Result result{};
+        result.m_nPublishedFileId = id;
+        result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
+        auto item = s.items.find(id);
+        if (result.m_eResult == k_EResultOK && item == s.items.end())
+            result.m_eResult = k_EResultFileNotFound;
+        if (result.m_eResult == k_EResultOK)
+            SetSubscribed(item->second, subscribe);
+        return QueueResult(s, result, call.faults);
+    }
 };
 
 }  // namespace
 
-ISteamUGC* SimUGC() {
-  static SimSteamUGC instance;
-  return &instance;
+ISteamUGC* SimUGC()
+{
+    static SimSteamUGC instance;
+    return &instance;
 }
 
 }  // namespace simclient

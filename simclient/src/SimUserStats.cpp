@@ -10,94 +10,117 @@
 namespace simclient {
 namespace {
 
-uint64 GameIdOr(uint64 configured, AppId_t appId) { return configured ? configured : appId; }
+uint64 GameIdOr(uint64 configured, AppId_t appId)
+{
+    return configured ? configured : appId;
+}
 
 }  // namespace
 
-bool SimSteamUserStats::RequestCurrentStats() {
-  CallScope call("RequestCurrentStats", "");
-  WorldState& s = call.state;
-  if (call.faults.fail || !s.loggedOn) return false;
-  UserStatsReceived_t received{};
-  received.m_nGameID = GameIdOr(s.statsReceivedGameId, s.appId);
-  received.m_eResult = call.faults.result.value_or(s.statsReceivedResult);
-  received.m_steamIDUser = CSteamID(s.userId);
-  s.QueueCallback(UserStatsReceived_t::k_iCallback, &received, sizeof received,
-                  call.faults.extraLatency);
-  return true;
+bool SimSteamUserStats::RequestCurrentStats()
+{
+    CallScope call("RequestCurrentStats", "");
+    WorldState& s = call.state;
+    if (call.faults.fail || !s.loggedOn)
+        return false;
+    UserStatsReceived_t received{};
+    received.m_nGameID = GameIdOr(s.statsReceivedGameId, s.appId);
+    received.m_eResult = call.faults.result.value_or(s.statsReceivedResult);
+    received.m_steamIDUser = CSteamID(s.userId);
+    s.QueueCallback(UserStatsReceived_t::k_iCallback, &received, sizeof received, call.faults.extraLatency);
+    return true;
 }
 
-bool SimSteamUserStats::GetStat(const char* pchName, int32* pData) {
-  CallScope call("GetStat", Args(pchName));
-  if (call.faults.fail || !pchName || !pData) return false;
-  auto found = call.state.stats.find(pchName);
-  if (found == call.state.stats.end()) return false;
-  *pData = found->second;
-  return true;
+bool SimSteamUserStats::GetStat(const char* pchName, int32* pData)
+{
+    CallScope call("GetStat", Args(pchName));
+    if (call.faults.fail || !pchName || !pData)
+        return false;
+    auto found = call.state.stats.find(pchName);
+    if (found == call.state.stats.end())
+        return false;
+    *pData = found->second;
+    return true;
 }
 
-bool SimSteamUserStats::GetStat(const char* pchName, float* pData) {
-  CallScope call("GetStatFloat", Args(pchName));
-  if (call.faults.fail || !pchName || !pData) return false;
-  auto found = call.state.stats.find(pchName);
-  if (found == call.state.stats.end()) return false;
-  *pData = static_cast<float>(found->second);
-  return true;
+bool SimSteamUserStats::GetStat(const char* pchName, float* pData)
+{
+    CallScope call("GetStatFloat", Args(pchName));
+    if (call.faults.fail || !pchName || !pData)
+        return false;
+    auto found = call.state.stats.find(pchName);
+    if (found == call.state.stats.end())
+        return false;
+    *pData = static_cast<float>(found->second);
+    return true;
 }
 
-bool SimSteamUserStats::SetStat(const char* pchName, int32 nData) {
-  CallScope call("SetStat", Args(pchName, nData));
-  if (call.faults.fail || !pchName) return false;
-  auto found = call.state.stats.find(pchName);
-  if (found == call.state.stats.end()) return false;
-  found->second = nData;
-  return true;
+bool SimSteamUserStats::SetStat(const char* pchName, int32 nData)
+{
+    CallScope call("SetStat", Args(pchName, nData));
+    if (call.faults.fail || !pchName)
+        return false;
+    auto found = call.state.stats.find(pchName);
+    if (found == call.state.stats.end())
+        return false;
+    found->second = nData;
+    return true;
 }
 
-bool SimSteamUserStats::SetStat(const char* pchName, float fData) {
-  CallScope call("SetStatFloat", Args(pchName, fData));
-  if (call.faults.fail || !pchName) return false;
-  auto found = call.state.stats.find(pchName);
-  if (found == call.state.stats.end()) return false;
-  found->second = static_cast<int32>(fData);
-  return true;
+bool SimSteamUserStats::SetStat(const char* pchName, float fData)
+{
+    CallScope call("SetStatFloat", Args(pchName, fData));
+    if (call.faults.fail || !pchName)
+        return false;
+    auto found = call.state.stats.find(pchName);
+    if (found == call.state.stats.end())
+        return false;
+    found->second = static_cast<int32>(fData);
+    return true;
 }
 
-bool SimSteamUserStats::SetAchievement(const char* pchName) {
-  CallScope call("SetAchievement", Args(pchName));
-  if (call.faults.fail || !pchName) return false;
-  auto found = call.state.achievements.find(pchName);
-  if (found == call.state.achievements.end()) return false;
-  if (!found->second) call.state.unlockedSinceStore.insert(pchName);
-  found->second = true;
-  return true;
+bool SimSteamUserStats::SetAchievement(const char* pchName)
+{
+    CallScope call("SetAchievement", Args(pchName));
+    if (call.faults.fail || !pchName)
+        return false;
+    auto found = call.state.achievements.find(pchName);
+    if (found == call.state.achievements.end())
+        return false;
+    if (!found->second)
+        call.state.unlockedSinceStore.insert(pchName);
+    found->second = true;
+    return true;
 }
 
-bool SimSteamUserStats::StoreStats() {
-  CallScope call("StoreStats", "");
-  WorldState& s = call.state;
-  if (call.faults.fail || !s.loggedOn) return false;
-  UserStatsStored_t stored{};
-  stored.m_nGameID = GameIdOr(s.statsStoredGameId, s.appId);
-  stored.m_eResult = call.faults.result.value_or(s.statsStoredResult);
-  s.QueueCallback(UserStatsStored_t::k_iCallback, &stored, sizeof stored,
-                  call.faults.extraLatency);
-  if (stored.m_eResult != k_EResultOK) return true;  // unlocks stay pending for the next store
-  for (const std::string& name : s.unlockedSinceStore) {
-    UserAchievementStored_t achievement{};
-    achievement.m_nGameID = stored.m_nGameID;
-    std::strncpy(achievement.m_rgchAchievementName, name.c_str(),
-                 sizeof achievement.m_rgchAchievementName - 1);
-    s.QueueCallback(UserAchievementStored_t::k_iCallback, &achievement, sizeof achievement,
-                    call.faults.extraLatency);
-  }
-  s.unlockedSinceStore.clear();
-  return true;
+bool SimSteamUserStats::StoreStats()
+{
+    CallScope call("StoreStats", "");
+    WorldState& s = call.state;
+    if (call.faults.fail || !s.loggedOn)
+        return false;
+    UserStatsStored_t stored{};
+    stored.m_nGameID = GameIdOr(s.statsStoredGameId, s.appId);
+    stored.m_eResult = call.faults.result.value_or(s.statsStoredResult);
+    s.QueueCallback(UserStatsStored_t::k_iCallback, &stored, sizeof stored, call.faults.extraLatency);
+    if (stored.m_eResult != k_EResultOK)
+        return true;  // unlocks stay pending for the next store
+    for (const std::string& name : s.unlockedSinceStore) {
+        UserAchievementStored_t achievement{};
+        achievement.m_nGameID = stored.m_nGameID;
+        std::strncpy(achievement.m_rgchAchievementName, name.c_str(),
+                     sizeof achievement.m_rgchAchievementName - 1);
+        s.QueueCallback(UserAchievementStored_t::k_iCallback, &achievement, sizeof achievement,
+                        call.faults.extraLatency);
+    }
+    s.unlockedSinceStore.clear();
+    return true;
 }
 
-ISteamUserStats* SimUserStats() {
-  static SimSteamUserStats instance;
-  return &instance;
+ISteamUserStats* SimUserStats()
+{
+    static SimSteamUserStats instance;
+    return &instance;
 }
 
 }  // namespace simclient

@@ -7,217 +7,333 @@
 namespace simclient {
 
 namespace {
-std::unique_lock<std::mutex> Lock() { return std::unique_lock<std::mutex>(State().mutex); }
+std::unique_lock<std::mutex> Lock()
+{
+    return std::unique_lock<std::mutex>(State().mutex);
+}
 }  // namespace
 
-World& GetWorld() {
-  static World world;
-  return world;
+World& GetWorld()
+{
+    static World world;
+    return world;
 }
 
-void World::Reset() {
-  auto lock = Lock();
-  State().ResetData();
+void World::Reset()
+{
+    auto lock = Lock();
+    State().ResetData();
 }
 
-void World::SetSteamRunning(bool running) { auto l = Lock(); State().steamRunning = running; }
-void World::SetInitSucceeds(bool succeeds) { auto l = Lock(); State().initSucceeds = succeeds; }
-bool World::IsInitialised() const { auto l = Lock(); return State().initialised; }
-
-void World::SetInterfaceAvailable(Interface which, bool available) {
-  auto l = Lock();
-  State().available[int(which)] = available;
-  State().BumpGeneration();
-}
-bool World::IsInterfaceAvailable(Interface which) const {
-  auto l = Lock();
-  return State().available[int(which)];
-}
-uintptr_t World::InterfaceGeneration() const { return State().generation.load(); }
-
-void World::SetLocalUser(uint64 steamId, bool loggedOn, const std::string& personaName) {
-  auto l = Lock();
-  State().userId = steamId;
-  State().loggedOn = loggedOn;
-  State().personaName = personaName;
-}
-uint64 World::LocalUserId() const { auto l = Lock(); return State().userId; }
-void World::SetAppId(AppId_t appId) { auto l = Lock(); State().appId = appId; }
-void World::SetOverlayEnabled(bool enabled) { auto l = Lock(); State().overlayEnabled = enabled; }
-void World::SetServerTime(uint32 t) { auto l = Lock(); State().serverTime = t; }
-std::optional<ENotificationPosition> World::NotificationPosition() const {
-  auto l = Lock();
-  return State().notificationPosition;
-}
-void World::SetGameLanguage(std::optional<std::string> language) {
-  auto l = Lock();
-  State().language = std::move(language);
-}
-void World::SetBetaName(std::optional<std::string> branch) {
-  auto l = Lock();
-  State().beta = std::move(branch);
-}
-void World::SetDlcs(std::vector<Dlc> dlcs) { auto l = Lock(); State().dlcs = std::move(dlcs); }
-void World::SetDlcInstalled(AppId_t appId, bool installed) {
-  auto l = Lock();
-  for (Dlc& dlc : State().dlcs)
-    if (dlc.appId == appId) dlc.installed = installed;
-}
-
-void World::SetLatency(int pumps) { auto l = Lock(); State().latency = pumps < 1 ? 1 : pumps; }
-void World::PostCallback(int callbackId, const void* data, std::size_t size) {
-  auto l = Lock();
-  State().QueueCallback(callbackId, data, size);
-}
-void World::SetOverlayActive(bool active) {
-  GameOverlayActivated_t overlay{};
-  overlay.m_bActive = active ? 1 : 0;
-  Post(overlay);
-}
-std::size_t World::PendingCount() const { auto l = Lock(); return State().queue.size(); }
-uint64 World::PumpCount() const { auto l = Lock(); return State().pump; }
-int World::RegisteredCallbackCount(int callbackId) const {
-  auto l = Lock();
-  auto found = State().callbacks.find(callbackId);
-  return found == State().callbacks.end() ? 0 : static_cast<int>(found->second.size());
-}
-std::size_t World::BoundCallResultCount() const { auto l = Lock(); return State().callResults.size(); }
-
-void World::InjectFault(const std::string& call, Fault fault) {
-  auto l = Lock();
-  State().faults[call].push_back(fault);
-}
-void World::ClearFaults() { auto l = Lock(); State().faults.clear(); }
-
-Journal World::GetJournal() const { auto l = Lock(); return Journal(State().journal); }
-void World::ClearJournal() { auto l = Lock(); State().journal.clear(); }
-void World::SetJournalEnabled(bool enabled) { State().journalEnabled.store(enabled); }
-
-bool World::EmitWarning(int severity, const char* text) {
-  SteamAPIWarningMessageHook_t hook;
-  {
+void World::SetSteamRunning(bool running)
+{
     auto l = Lock();
-    hook = State().warningHook;
-  }
-  if (!hook) return false;
-  hook(severity, text);  // outside the lock: the hook may call the SDK
-  return true;
+    State().steamRunning = running;
 }
-bool World::HasWarningHook() const { auto l = Lock(); return State().warningHook != nullptr; }
-
-void World::DefineStat(const std::string& name, int32 value) {
-  auto l = Lock();
-  State().stats[name] = value;
+void World::SetInitSucceeds(bool succeeds)
+{
+    auto l = Lock();
+    State().initSucceeds = succeeds;
 }
-std::optional<int32> World::Stat(const std::string& name) const {
-  auto l = Lock();
-  auto found = State().stats.find(name);
-  if (found == State().stats.end()) return std::nullopt;
-  return found->second;
-}
-void World::DefineAchievement(const std::string& name, bool unlocked) {
-  auto l = Lock();
-  State().achievements[name] = unlocked;
-}
-std::optional<bool> World::AchievementUnlocked(const std::string& name) const {
-  auto l = Lock();
-  auto found = State().achievements.find(name);
-  if (found == State().achievements.end()) return std::nullopt;
-  return found->second;
-}
-void World::SetStatsReceivedResult(EResult result, uint64 gameId) {
-  auto l = Lock();
-  State().statsReceivedResult = result;
-  State().statsReceivedGameId = gameId;
-}
-void World::SetStatsStoredResult(EResult result, uint64 gameId) {
-  auto l = Lock();
-  State().statsStoredResult = result;
-  State().statsStoredGameId = gameId;
+bool World::IsInitialised() const
+{
+    auto l = Lock();
+    return State().initialised;
 }
 
-void World::PutFile(const std::string& name, std::vector<uint8> bytes) {
-  auto l = Lock();
-  State().files[name] = std::move(bytes);
+void World::SetInterfaceAvailable(Interface which, bool available)
+{
+    auto l = Lock();
+    State().available[int(which)] = available;
+    State().BumpGeneration();
 }
-std::optional<std::vector<uint8>> World::File(const std::string& name) const {
-  auto l = Lock();
-  auto found = State().files.find(name);
-  if (found == State().files.end()) return std::nullopt;
-  return found->second;
+bool World::IsInterfaceAvailable(Interface which) const
+{
+    auto l = Lock();
+    return State().available[int(which)];
 }
-std::optional<bool> World::CloudEnabledForApp() const {
-  auto l = Lock();
-  return State().cloudEnabledForApp;
+uintptr_t World::InterfaceGeneration() const
+{
+    return State().generation.load();
 }
 
-void World::SetPersonaName(uint64 steamId, const std::string& name, bool known) {
-  auto l = Lock();
-  State().personas[steamId] = {name, known};
+void World::SetLocalUser(uint64 steamId, bool loggedOn, const std::string& personaName)
+{
+    auto l = Lock();
+    State().userId = steamId;
+    State().loggedOn = loggedOn;
+    State().personaName = personaName;
 }
-void World::SetFriends(std::vector<uint64> steamIds) {
-  auto l = Lock();
-  State().friends = std::move(steamIds);
+uint64 World::LocalUserId() const
+{
+    auto l = Lock();
+    return State().userId;
 }
-std::vector<std::pair<AppId_t, EOverlayToStoreFlag>> World::StoreOverlayRequests() const {
-  auto l = Lock();
-  return State().storeRequests;
+void World::SetAppId(AppId_t appId)
+{
+    auto l = Lock();
+    State().appId = appId;
 }
-std::vector<std::pair<std::string, EActivateGameOverlayToWebPageMode>> World::WebPageRequests()
-    const {
-  auto l = Lock();
-  return State().webRequests;
+void World::SetOverlayEnabled(bool enabled)
+{
+    auto l = Lock();
+    State().overlayEnabled = enabled;
+}
+void World::SetServerTime(uint32 t)
+{
+    auto l = Lock();
+    State().serverTime = t;
+}
+std::optional<ENotificationPosition> World::NotificationPosition() const
+{
+    auto l = Lock();
+    return State().notificationPosition;
+}
+void World::SetGameLanguage(std::optional<std::string> language)
+{
+    auto l = Lock();
+    State().language = std::move(language);
+}
+void World::SetBetaName(std::optional<std::string> branch)
+{
+    auto l = Lock();
+    State().beta = std::move(branch);
+}
+void World::SetDlcs(std::vector<Dlc> dlcs)
+{
+    auto l = Lock();
+    State().dlcs = std::move(dlcs);
+}
+void World::SetDlcInstalled(AppId_t appId, bool installed)
+{
+    auto l = Lock();
+    for (Dlc& dlc : State().dlcs)
+        if (dlc.appId == appId)
+            dlc.installed = installed;
+}
+
+void World::SetLatency(int pumps)
+{
+    auto l = Lock();
+    State().latency = pumps < 1 ? 1 : pumps;
+}
+void World::PostCallback(int callbackId, const void* data, std::size_t size)
+{
+    auto l = Lock();
+    State().QueueCallback(callbackId, data, size);
+}
+void World::SetOverlayActive(bool active)
+{
+    GameOverlayActivated_t overlay{};
+    overlay.m_bActive = active ? 1 : 0;
+    Post(overlay);
+}
+std::size_t World::PendingCount() const
+{
+    auto l = Lock();
+    return State().queue.size();
+}
+uint64 World::PumpCount() const
+{
+    auto l = Lock();
+    return State().pump;
+}
+int World::RegisteredCallbackCount(int callbackId) const
+{
+    auto l = Lock();
+    auto found = State().callbacks.find(callbackId);
+    return found == State().callbacks.end() ? 0 : static_cast<int>(found->second.size());
+}
+std::size_t World::BoundCallResultCount() const
+{
+    auto l = Lock();
+    return State().callResults.size();
+}
+
+void World::InjectFault(const std::string& call, Fault fault)
+{
+    auto l = Lock();
+    State().faults[call].push_back(fault);
+}
+void World::ClearFaults()
+{
+    auto l = Lock();
+    State().faults.clear();
+}
+
+Journal World::GetJournal() const
+{
+    auto l = Lock();
+    return Journal(State().journal);
+}
+void World::ClearJournal()
+{
+    auto l = Lock();
+    State().journal.clear();
+}
+void World::SetJournalEnabled(bool enabled)
+{
+    State().journalEnabled.store(enabled);
+}
+
+bool World::EmitWarning(int severity, const char* text)
+{
+    SteamAPIWarningMessageHook_t hook;
+    {
+        auto l = Lock();
+        hook = State().warningHook;
+    }
+    if (!hook)
+        return false;
+    hook(severity, text);  // outside the lock: the hook may call the SDK
+    return true;
+}
+bool World::HasWarningHook() const
+{
+    auto l = Lock();
+    return State().warningHook != nullptr;
+}
+
+void World::DefineStat(const std::string& name, int32 value)
+{
+    auto l = Lock();
+    State().stats[name] = value;
+}
+std::optional<int32> World::Stat(const std::string& name) const
+{
+    auto l = Lock();
+    auto found = State().stats.find(name);
+    if (found == State().stats.end())
+        return std::nullopt;
+    return found->second;
+}
+void World::DefineAchievement(const std::string& name, bool unlocked)
+{
+    auto l = Lock();
+    State().achievements[name] = unlocked;
+}
+std::optional<bool> World::AchievementUnlocked(const std::string& name) const
+{
+    auto l = Lock();
+    auto found = State().achievements.find(name);
+    if (found == State().achievements.end())
+        return std::nullopt;
+    return found->second;
+}
+void World::SetStatsReceivedResult(EResult result, uint64 gameId)
+{
+    auto l = Lock();
+    State().statsReceivedResult = result;
+    State().statsReceivedGameId = gameId;
+}
+void World::SetStatsStoredResult(EResult result, uint64 gameId)
+{
+    auto l = Lock();
+    State().statsStoredResult = result;
+    State().statsStoredGameId = gameId;
+}
+
+void World::PutFile(const std::string& name, std::vector<uint8> bytes)
+{
+    auto l = Lock();
+    State().files[name] = std::move(bytes);
+}
+std::optional<std::vector<uint8>> World::File(const std::string& name) const
+{
+    auto l = Lock();
+    auto found = State().files.find(name);
+    if (found == State().files.end())
+        return std::nullopt;
+    return found->second;
+}
+std::optional<bool> World::CloudEnabledForApp() const
+{
+    auto l = Lock();
+    return State().cloudEnabledForApp;
+}
+
+void World::SetPersonaName(uint64 steamId, const std::string& name, bool known)
+{
+    auto l = Lock();
+    State().personas[steamId] = {name, known};
+}
+void World::SetFriends(std::vector<uint64> steamIds)
+{
+    auto l = Lock();
+    State().friends = std::move(steamIds);
+}
+std::vector<std::pair<AppId_t, EOverlayToStoreFlag>> World::StoreOverlayRequests() const
+{
+    auto l = Lock();
+    return State().storeRequests;
+}
+std::vector<std::pair<std::string, EActivateGameOverlayToWebPageMode>> World::WebPageRequests() const
+{
+    auto l = Lock();
+    return State().webRequests;
 }
 
 void World::AddLeaderboard(const std::string& name, ELeaderboardSortMethod sort,
-                           ELeaderboardDisplayType display, std::vector<LeaderboardRow> rows) {
-  auto l = Lock();
-  Leaderboard board;
-  board.handle = State().leaderboards.size() + 1;
-  board.name = name;
-  board.sort = sort;
-  board.display = display;
-  board.rows = std::move(rows);
-  SortRows(board);
-  State().leaderboards.push_back(std::move(board));
+                           ELeaderboardDisplayType display, std::vector<LeaderboardRow> rows)
+{
+    auto l = Lock();
+    Leaderboard board;
+    board.handle = State().leaderboards.size() + 1;
+    board.name = name;
+    board.sort = sort;
+    board.display = display;
+    board.rows = std::move(rows);
+    SortRows(board);
+    State().leaderboards.push_back(std::move(board));
 }
-bool World::HasLeaderboard(const std::string& name) const {
-  auto l = Lock();
-  for (const Leaderboard& b : State().leaderboards)
-    if (b.name == name) return true;
-  return false;
+bool World::HasLeaderboard(const std::string& name) const
+{
+    auto l = Lock();
+    for (const Leaderboard& b : State().leaderboards)
+        if (b.name == name)
+            return true;
+    return false;
 }
-std::vector<LeaderboardRow> World::LeaderboardRows(const std::string& name) const {
-  auto l = Lock();
-  for (const Leaderboard& b : State().leaderboards)
-    if (b.name == name) return b.rows;
-  return {};
+std::vector<LeaderboardRow> World::LeaderboardRows(const std::string& name) const
+{
+    auto l = Lock();
+    for (const Leaderboard& b : State().leaderboards)
+        if (b.name == name)
+            return b.rows;
+    return {};
 }
 
-void World::AddWorkshopItem(WorkshopItem item) {
-  auto l = Lock();
-  if (item.subscribed) item.state |= k_EItemStateSubscribed;
-  State().items[item.id] = std::move(item);
+void World::AddWorkshopItem(WorkshopItem item)
+{
+    auto l = Lock();
+    if (item.subscribed)
+        item.state |= k_EItemStateSubscribed;
+    State().items[item.id] = std::move(item);
 }
-std::optional<WorkshopItem> World::GetWorkshopItem(PublishedFileId_t id) const {
-  auto l = Lock();
-  auto found = State().items.find(id);
-  if (found == State().items.end()) return std::nullopt;
-  return found->second;
+std::optional<WorkshopItem> World::GetWorkshopItem(PublishedFileId_t id) const
+{
+    auto l = Lock();
+    auto found = State().items.find(id);
+    if (found == State().items.end())
+        return std::nullopt;
+    return found->second;
 }
-void World::SetUpdateProgress(EItemUpdateStatus status, uint64 processed, uint64 total) {
-  auto l = Lock();
-  State().updateStatus = status;
-  State().updateProcessed = processed;
-  State().updateTotal = total;
+void World::SetUpdateProgress(EItemUpdateStatus status, uint64 processed, uint64 total)
+{
+    auto l = Lock();
+    State().updateStatus = status;
+    State().updateProcessed = processed;
+    State().updateTotal = total;
 }
-void World::SetNeedsLegalAgreement(bool needs) {
-  auto l = Lock();
-  State().needsLegalAgreement = needs;
+void World::SetNeedsLegalAgreement(bool needs)
+{
+    auto l = Lock();
+    State().needsLegalAgreement = needs;
 }
-std::vector<WorkshopSubmission> World::Submissions() const {
-  auto l = Lock();
-  return State().submissions;
+std::vector<WorkshopSubmission> World::Submissions() const
+{
+    auto l = Lock();
+    return State().submissions;
 }
 
 }  // namespace simclient

@@ -81,7 +81,8 @@ void Clock::Sleep(uint32_t milliseconds, const std::string& threadName)
     if (manual_) {
         if (milliseconds == 0)
             return;
-        auto self = sleepers_.insert(sleepers_.end(), Sleeper{threadName, manualNowMs_ + milliseconds, false});
+        auto self =
+            sleepers_.insert(sleepers_.end(), Sleeper{threadName, manualNowMs_ + milliseconds, false});
         changed_.notify_all();  // a test may be waiting for this thread to sleep
         changed_.wait(lock, [&] { return self->woken; });
         sleepers_.erase(self);

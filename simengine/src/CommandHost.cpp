@@ -31,7 +31,8 @@ const char* CommandHost::Handle(const char* command, const char* argument)
     std::optional<std::string> argumentCopy;
     if (argument != nullptr)
         argumentCopy = argument;
-    journal_.Record(CommandCall{name, std::move(argumentCopy), std::move(answer), ThreadRegistry::CurrentName()});
+    journal_.Record(
+        CommandCall{name, std::move(argumentCopy), std::move(answer), ThreadRegistry::CurrentName()});
     return result;
 }
 

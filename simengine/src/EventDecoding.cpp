@@ -35,8 +35,7 @@ constexpr size_t kEntryDetailsSize = 324;
 constexpr size_t kEntryReserved = 328;
 constexpr size_t kEntryTextRoom = 64;
 
-template <typename T>
-T ReadAt(const unsigned char* bytes, size_t offset)
+template <typename T> T ReadAt(const unsigned char* bytes, size_t offset)
 {
     T value;
     std::memcpy(&value, bytes + offset, sizeof(T));
@@ -78,8 +77,8 @@ public:
         size_t rows = static_cast<size_t>(fields.count);
         size_t blockSize = 0;
         if (memory_.FindAllocation(entries, &blockSize) && blockSize / kScoreEntrySize < rows) {
-            journal_.Fault("score event count " + std::to_string(fields.count) + " exceeds its entries block of " +
-                           std::to_string(blockSize) + " bytes");
+            journal_.Fault("score event count " + std::to_string(fields.count) +
+                           " exceeds its entries block of " + std::to_string(blockSize) + " bytes");
             rows = blockSize / kScoreEntrySize;
         }
         for (size_t i = 0; i < rows; ++i)

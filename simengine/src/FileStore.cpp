@@ -43,7 +43,10 @@ std::shared_ptr<const std::string> ReadWholeFile(const std::string& nativePath)
 
 FileStore::FileStore(Journal& journal, PathMapper& paths) : journal_(journal), paths_(paths) {}
 
-FileStore::~FileStore() { Reset(); }
+FileStore::~FileStore()
+{
+    Reset();
+}
 
 void FileStore::AddMemoryFile(const std::string& enginePath, std::string bytes)
 {
@@ -116,7 +119,8 @@ HostFile* FileStore::Open(const char* path, const char* mode)
 
     journal_.Record(FileOpenCall{enginePath, modeText, result != nullptr, inMemory});
     if (!readMode)
-        journal_.Fault("FileOpen of '" + enginePath + "' with mode '" + modeText + "': the engine only reads");
+        journal_.Fault("FileOpen of '" + enginePath + "' with mode '" + modeText +
+                       "': the engine only reads");
     return result;
 }
 
@@ -124,7 +128,8 @@ FileStore::OpenFile* FileStore::FindOpenLocked(HostFile* file, const char* opera
 {
     auto found = files_.find(file);
     if (found == files_.end() || !found->second->open) {
-        journal_.Fault(std::string(operation) + (found == files_.end() ? " of an unknown file" : " of a closed file"));
+        journal_.Fault(std::string(operation) +
+                       (found == files_.end() ? " of an unknown file" : " of a closed file"));
         return nullptr;
     }
     return found->second.get();
@@ -198,8 +203,8 @@ void FileStore::Close(HostFile* file)
 int FileStore::OpenFileCount() const
 {
     std::lock_guard<std::mutex> lock(mutex_);
-    return static_cast<int>(std::count_if(files_.begin(), files_.end(),
-                                          [](const auto& entry) { return entry.second->open; }));
+    return static_cast<int>(
+        std::count_if(files_.begin(), files_.end(), [](const auto& entry) { return entry.second->open; }));
 }
 
 int FileStore::ReadCalls(const std::string& enginePath) const

@@ -4,7 +4,10 @@
 
 namespace simengine {
 
-std::vector<PostedEvent> JournalView::Events() const { return All<PostedEvent>(); }
+std::vector<PostedEvent> JournalView::Events() const
+{
+    return All<PostedEvent>();
+}
 
 std::vector<PostedEvent> JournalView::Events(int32_t type) const
 {
@@ -15,7 +18,10 @@ std::vector<PostedEvent> JournalView::Events(int32_t type) const
     return found;
 }
 
-std::vector<LogLine> JournalView::Logs() const { return All<LogLine>(); }
+std::vector<LogLine> JournalView::Logs() const
+{
+    return All<LogLine>();
+}
 
 std::vector<LogLine> JournalView::Logs(LogKind kind) const
 {
@@ -43,7 +49,10 @@ std::vector<std::string> JournalView::LogTexts() const
     return texts;
 }
 
-std::vector<CommandCall> JournalView::Commands() const { return All<CommandCall>(); }
+std::vector<CommandCall> JournalView::Commands() const
+{
+    return All<CommandCall>();
+}
 
 std::vector<CommandCall> JournalView::Commands(const std::string& command) const
 {
@@ -62,10 +71,22 @@ std::vector<std::string> JournalView::Popups() const
     return texts;
 }
 
-std::vector<InputCall> JournalView::Inputs() const { return All<InputCall>(); }
-std::vector<FileOpenCall> JournalView::FileOpens() const { return All<FileOpenCall>(); }
-std::vector<ThreadStartCall> JournalView::ThreadStarts() const { return All<ThreadStartCall>(); }
-std::vector<EngineFault> JournalView::Faults() const { return All<EngineFault>(); }
+std::vector<InputCall> JournalView::Inputs() const
+{
+    return All<InputCall>();
+}
+std::vector<FileOpenCall> JournalView::FileOpens() const
+{
+    return All<FileOpenCall>();
+}
+std::vector<ThreadStartCall> JournalView::ThreadStarts() const
+{
+    return All<ThreadStartCall>();
+}
+std::vector<EngineFault> JournalView::Faults() const
+{
+    return All<EngineFault>();
+}
 
 void Journal::Record(JournalRecord record)
 {

@@ -7,7 +7,10 @@
 
 namespace simengine {
 
-MemoryTracker::~MemoryTracker() { FreeAll(); }
+MemoryTracker::~MemoryTracker()
+{
+    FreeAll();
+}
 
 HostBuffer* MemoryTracker::CreateBuffer(uint32_t size)
 {

@@ -18,7 +18,10 @@ std::string LastDlError()
 
 }  // namespace
 
-ModuleLoader::~ModuleLoader() { Unload(); }
+ModuleLoader::~ModuleLoader()
+{
+    Unload();
+}
 
 bool ModuleLoader::Load(const std::string& path)
 {

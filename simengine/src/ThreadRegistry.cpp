@@ -12,7 +12,10 @@ thread_local std::string currentThreadName = "main";
 
 }  // namespace
 
-ThreadRegistry::~ThreadRegistry() { JoinAll(); }
+ThreadRegistry::~ThreadRegistry()
+{
+    JoinAll();
+}
 
 void ThreadRegistry::Start(const char* name, HostThreadEntry entry, void* argument, int32_t flags)
 {
@@ -63,9 +66,15 @@ void ThreadRegistry::JoinMatching(const std::string* name)
     }
 }
 
-void ThreadRegistry::JoinAll() { JoinMatching(nullptr); }
+void ThreadRegistry::JoinAll()
+{
+    JoinMatching(nullptr);
+}
 
-void ThreadRegistry::Join(const std::string& name) { JoinMatching(&name); }
+void ThreadRegistry::Join(const std::string& name)
+{
+    JoinMatching(&name);
+}
 
 int ThreadRegistry::StartedCount(const std::string& name) const
 {
@@ -98,8 +107,14 @@ int ThreadRegistry::RunningCount(const std::string& name) const
     return count;
 }
 
-std::string ThreadRegistry::CurrentName() { return currentThreadName; }
+std::string ThreadRegistry::CurrentName()
+{
+    return currentThreadName;
+}
 
-void ThreadRegistry::SetCurrentName(std::string name) { currentThreadName = std::move(name); }
+void ThreadRegistry::SetCurrentName(std::string name)
+{
+    currentThreadName = std::move(name);
+}
 
 }  // namespace simengine

@@ -11,7 +11,7 @@ HostFileApi* Files()
     return hostServices != nullptr ? hostServices->files : nullptr;
 }
 
-} // namespace
+}  // namespace
 
 void CsvReader::Close()
 {
@@ -102,7 +102,8 @@ bool Database::LoadCsv(const char* newPath)
     CsvReader reader;
     if (!reader.Open(newPath)) {
         if (hostServices != nullptr && hostServices->ReportError != nullptr)
-            hostServices->ReportError(1, "CSV Array File '%s' not found!", newPath != nullptr ? newPath : "null");
+            hostServices->ReportError(1, "CSV Array File '%s' not found!",
+                                      newPath != nullptr ? newPath : "null");
         reader.Close();
         return false;
     }
@@ -117,8 +118,8 @@ bool Database::LoadCsv(const char* newPath)
         ++rows;
         node->ReserveValues(reader.columnCount);
         for (int32_t i = 0; i < reader.columnCount; ++i) {
-            const bool present =
-                !reader.AtEnd() && reader.ReadField(field, CsvReader::kDataFieldLimit) == CsvReader::Field::Complete;
+            const bool present = !reader.AtEnd() && reader.ReadField(field, CsvReader::kDataFieldLimit) ==
+                                                        CsvReader::Field::Complete;
             node->AddValue(reader.columnNames[i], present ? field : nullptr);
         }
     }

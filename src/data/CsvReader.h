@@ -17,8 +17,8 @@ public:
     static constexpr int32_t kDataFieldLimit = 4095;
 
     enum class Field {
-        Complete,   // ended by a separator, or at the end with 2 bytes or more
-        Absent,     // 0 or 1 byte at the end of the file with no separator behind
+        Complete,  // ended by a separator, or at the end with 2 bytes or more
+        Absent,    // 0 or 1 byte at the end of the file with no separator behind
     };
 
     CsvReader() = default;

@@ -16,7 +16,7 @@ char* CopyValue(const char* value, BlockArena* arena)
     return arena != nullptr ? arena->CopyText(value, &length) : DuplicateText(value);
 }
 
-} // namespace
+}  // namespace
 
 DataArray::~DataArray()
 {

@@ -40,9 +40,9 @@ public:
     // without nodes: FindNode(database.FindArray("a"), "x").
     static const DataNode* FindNode(const DataArray* array, const char* id);
 
-    HashedName name;                // no text: no lookup finds the array
-    ValueArray<DataValue> values;   // filled from the file, read by nobody here
-    PtrArray<DataNode> nodes;       // owned
-    Database* database = nullptr;   // the database holding this array, not owned
-    BlockArena* arena = nullptr;    // where its texts and nodes live; null: the heap
+    HashedName name;               // no text: no lookup finds the array
+    ValueArray<DataValue> values;  // filled from the file, read by nobody here
+    PtrArray<DataNode> nodes;      // owned
+    Database* database = nullptr;  // the database holding this array, not owned
+    BlockArena* arena = nullptr;   // where its texts and nodes live; null: the heap
 };

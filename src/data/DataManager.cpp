@@ -38,7 +38,7 @@ bool EndsWith(const char* text, size_t length, const char* ending)
     return true;
 }
 
-} // namespace
+}  // namespace
 
 PtrArray<Database>& DataManager::Databases()
 {
@@ -50,7 +50,8 @@ Database* DataManager::GetDatabase(const char* path)
     // A new handle per request: the mutual exclusion rests on the engine giving
     // the same mutex for the same name.
     HostThreadApi* threads = Threads();
-    HostMutex* mutex = threads != nullptr && threads->CreateMutex != nullptr ? threads->CreateMutex("DATAMAN") : nullptr;
+    HostMutex* mutex =
+        threads != nullptr && threads->CreateMutex != nullptr ? threads->CreateMutex("DATAMAN") : nullptr;
     const uint32_t hash = HashText(path);
     const bool locking = mutex != nullptr && threads->LockMutex != nullptr && threads->UnlockMutex != nullptr;
     if (locking)
@@ -95,6 +96,7 @@ bool Database::Load(const char* newPath)
         return LoadXmlWithRetry(file);
 
     if (hostServices != nullptr && hostServices->ReportError != nullptr)
-        hostServices->ReportError(1, "Unknown database file type '%s'. Supported formats are: .csv .xml", file);
+        hostServices->ReportError(1, "Unknown database file type '%s'. Supported formats are: .csv .xml",
+                                  file);
     return false;
 }

@@ -35,8 +35,8 @@ public:
     // a value). Pairs with no name never match.
     const char* GetValue(const char* name) const;
 
-    HashedName id;                  // no text: reachable only by walking `nodes`
+    HashedName id;  // no text: reachable only by walking `nodes`
     ValueArray<DataValue> values;
-    DataArray* array = nullptr;     // the array holding this node, not owned
-    BlockArena* arena = nullptr;    // where its texts and pair block live; null: the heap
+    DataArray* array = nullptr;   // the array holding this node, not owned
+    BlockArena* arena = nullptr;  // where its texts and pair block live; null: the heap
 };

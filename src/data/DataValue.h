@@ -10,6 +10,6 @@ struct DataValue {
     // Frees heap texts.
     void Free();
 
-    HashedName name;          // no text: the pair never matches a lookup
-    char* value = nullptr;    // null: a pair without a value
+    HashedName name;        // no text: the pair never matches a lookup
+    char* value = nullptr;  // null: a pair without a value
 };

@@ -46,7 +46,7 @@ public:
     bool ReadXmlBlocks(XmlReader& reader);
     bool LoadCsv(const char* newPath);
 
-    HashedName path;                // never null once set: the key of the cache
-    PtrArray<DataArray> arrays;     // owned
-    BlockArena arena;               // the tree's texts, nodes and pair blocks
+    HashedName path;             // never null once set: the key of the cache
+    PtrArray<DataArray> arrays;  // owned
+    BlockArena arena;            // the tree's texts, nodes and pair blocks
 };

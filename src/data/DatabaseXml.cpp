@@ -29,14 +29,13 @@ bool IsId(const char* name)
     return name[0] == 'i' && name[1] == 'd' && name[2] == '\0';
 }
 
-template <typename... Args>
-void ReportLoadError(const char* format, Args... args)
+template <typename... Args> void ReportLoadError(const char* format, Args... args)
 {
     if (hostServices != nullptr && hostServices->ReportError != nullptr)
         hostServices->ReportError(1, format, args...);
 }
 
-} // namespace
+}  // namespace
 
 bool Database::LoadXmlWithRetry(const char* newPath)
 {
@@ -45,7 +44,8 @@ bool Database::LoadXmlWithRetry(const char* newPath)
             return true;
         if (hostServices == nullptr || hostServices->HostCommand == nullptr)
             return false;
-        const InlineString text = FormatString("CANCEL_TRY_CONTINUE,Failed to load XML file '%s'.", OrNull(newPath));
+        const InlineString text =
+            FormatString("CANCEL_TRY_CONTINUE,Failed to load XML file '%s'.", OrNull(newPath));
         const char* answer = hostServices->HostCommand("ShowPopup", text.Text());
         // Only the exact word tries again; any other answer, or none, gives up.
         if (answer == nullptr || std::strcmp(answer, "TRY_AGAIN") != 0)
@@ -73,9 +73,10 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
     // [1] The root: a plain open tag named "root".
     const XmlBlock* block = reader.ReadBlock();
     if (block == nullptr || block->closing || !Named(block, "root"))
-        return fail("DataManager: XML database needs to be contained within 'root' block (not expecting '%s'). "
-                    "'%s' is invalid.",
-                    OrNull(block != nullptr ? block->name : nullptr), file);
+        return fail(
+            "DataManager: XML database needs to be contained within 'root' block (not expecting '%s'). "
+            "'%s' is invalid.",
+            OrNull(block != nullptr ? block->name : nullptr), file);
     if (atEnd())
         return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
 
@@ -83,19 +84,22 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
         // [2] Top level: arrays until </root>, then nothing more.
         block = reader.ReadBlock();
         if (block == nullptr)
-            return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
+            return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.",
+                        file);
         if (block->closing && Named(block, "root")) {
             if (reader.ReadBlock() == nullptr)
                 return true;
             return fail("DataManager: No blocks can exist after </root>. '%s' is invalid.", file);
         }
         if (!Named(block, "array"))
-            return fail("DataManager: root/array/node structure violated. '%s' is not 'array'. '%s' is invalid.",
-                        OrNull(block->name), file);
+            return fail(
+                "DataManager: root/array/node structure violated. '%s' is not 'array'. '%s' is invalid.",
+                OrNull(block->name), file);
         if (block->closing) {
             // "</array>" or "<array .../>" here creates nothing.
             if (atEnd())
-                return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
+                return fail(
+                    "DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
             continue;
         }
 
@@ -122,11 +126,13 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
             }
             const bool isArray = Named(block, "array");
             if (isArray && !block->closing)
-                return fail("DataManager: File '%s' has enclosing arrays which is not supported. Not loaded.", file);
+                return fail("DataManager: File '%s' has enclosing arrays which is not supported. Not loaded.",
+                            file);
             if (!isArray && !Named(block, "node"))
-                return fail("DataManager: in '%s' is expecting to find two types of elements inside root: 'array' "
-                            "and 'node'. '%s' is not one of them.",
-                            file, OrNull(block->name));
+                return fail(
+                    "DataManager: in '%s' is expecting to find two types of elements inside root: 'array' "
+                    "and 'node'. '%s' is not one of them.",
+                    file, OrNull(block->name));
             if (isArray)
                 break;
 
@@ -148,8 +154,8 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
             // The block's texts are gone after this read: messages use the node's copy.
             const XmlBlock* next = reader.ReadBlock();
             if (next == nullptr)
-                return fail("DataManager: error parsing file '%s' after node #%d with id '%s'.", file, nodeCount,
-                            OrNull(node->id.text));
+                return fail("DataManager: error parsing file '%s' after node #%d with id '%s'.", file,
+                            nodeCount, OrNull(node->id.text));
             if (next->name == nullptr) {
                 // Its text, then one more block, dropped unseen.
                 node->AddValue(next->attributeNames[0], next->attributeValues[0]);
@@ -164,10 +170,12 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
                     pending = next;
             }
             if (atEnd())
-                return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
+                return fail(
+                    "DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
         }
 
         if (atEnd())
-            return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.", file);
+            return fail("DataManager: XML database needs to end with root block closing. '%s' is invalid.",
+                        file);
     }
 }

@@ -14,8 +14,7 @@ uint32_t HashBytes(const char* bytes, size_t length)
     uint32_t hash = 0;
     size_t i = 0;
     for (; i + 4 <= length; i += 4) {
-        hash = hash * 1874161u +
-               (byte[i] * 50653u + byte[i + 1] * 1369u + byte[i + 2] * 37u + byte[i + 3]);
+        hash = hash * 1874161u + (byte[i] * 50653u + byte[i + 1] * 1369u + byte[i + 2] * 37u + byte[i + 3]);
     }
     for (; i < length; ++i)
         hash = hash * 37u + byte[i];

@@ -35,7 +35,8 @@ uint32_t Descramble(const unsigned char* stored, int32_t length, unsigned char* 
     int32_t keyIndex = 0;
     for (int32_t i = 0; i < length; ++i) {
         const unsigned char s = stored[i];
-        sum += static_cast<uint32_t>(static_cast<int32_t>(static_cast<signed char>(s))) * static_cast<uint32_t>(i);
+        sum += static_cast<uint32_t>(static_cast<int32_t>(static_cast<signed char>(s))) *
+               static_cast<uint32_t>(i);
         plain[i] = static_cast<unsigned char>(s + static_cast<unsigned char>(kMagic[keyIndex]) + (i & 0xFF));
         if (++keyIndex == kKeyLength)
             keyIndex = 0;
@@ -51,11 +52,12 @@ uint32_t Scramble(const unsigned char* plain, int32_t length, unsigned char* sto
         const unsigned char s =
             static_cast<unsigned char>(plain[i] - static_cast<unsigned char>(kMagic[keyIndex]) - (i & 0xFF));
         stored[i] = s;
-        sum += static_cast<uint32_t>(static_cast<int32_t>(static_cast<signed char>(s))) * static_cast<uint32_t>(i);
+        sum += static_cast<uint32_t>(static_cast<int32_t>(static_cast<signed char>(s))) *
+               static_cast<uint32_t>(i);
         if (++keyIndex == kKeyLength)
             keyIndex = 0;
     }
     return sum;
 }
 
-} // namespace envelope
+}  // namespace envelope

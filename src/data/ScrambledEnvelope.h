@@ -16,7 +16,7 @@ namespace envelope {
 // The magic without its terminator is also the scrambling key.
 constexpr char kMagic[] = "MORVEN_STRATA";
 constexpr int32_t kKeyLength = 13;
-constexpr int32_t kMagicSize = kKeyLength + 1;   // the terminator is compared too
+constexpr int32_t kMagicSize = kKeyLength + 1;  // the terminator is compared too
 constexpr int32_t kHeaderSize = 22;
 
 // True if `bytes` start with the magic and its terminator and there are at least
@@ -35,4 +35,4 @@ uint32_t Descramble(const unsigned char* stored, int32_t length, unsigned char* 
 // and returns the checksum to write into the header.
 uint32_t Scramble(const unsigned char* plain, int32_t length, unsigned char* stored);
 
-} // namespace envelope
+}  // namespace envelope

@@ -29,14 +29,14 @@ namespace {
 // ---------------------------------------------------------------------------
 
 enum : unsigned char {
-    kWhite = 1 << 0,      // tab, line feed, carriage return, space: nothing else
-    kTagStop = 1 << 1,    // bytes that do more than being stored while in a tag
-    kTextStop = 1 << 2,   // ... while in text
-    kQuoteStop = 1 << 3,  // ... while between double quotes
-    kNameFirst = 1 << 4,  // may start an attribute name
-    kNameNext = 1 << 5,   // may follow in an attribute name
-    kNameEnd = 1 << 6,    // ends an element name: terminator, space, '>'
-    kAfterValue = 1 << 7, // may follow a value's closing quote: '>', '?', '/', whitespace
+    kWhite = 1 << 0,       // tab, line feed, carriage return, space: nothing else
+    kTagStop = 1 << 1,     // bytes that do more than being stored while in a tag
+    kTextStop = 1 << 2,    // ... while in text
+    kQuoteStop = 1 << 3,   // ... while between double quotes
+    kNameFirst = 1 << 4,   // may start an attribute name
+    kNameNext = 1 << 5,    // may follow in an attribute name
+    kNameEnd = 1 << 6,     // ends an element name: terminator, space, '>'
+    kAfterValue = 1 << 7,  // may follow a value's closing quote: '>', '?', '/', whitespace
 };
 
 struct CharClassTable {
@@ -73,8 +73,8 @@ constexpr CharClassTable kCharClasses;
 
 // Bytes that stop the walk over an attribute value in the token.
 enum : unsigned char {
-    kValueQuoted = 1 << 0, // between quotes: terminator, quote, backslash, '&'
-    kValueOpen = 1 << 1,   // outside them: those, space and '>'
+    kValueQuoted = 1 << 0,  // between quotes: terminator, quote, backslash, '&'
+    kValueOpen = 1 << 1,    // outside them: those, space and '>'
 };
 
 struct ValueClassTable {
@@ -163,8 +163,7 @@ constexpr int32_t kExcerptLimit = 254;
 constexpr int32_t kEncodingPieceSize = 512;
 
 // The reader's messages reach the engine only when it has given us its table.
-template <typename... Args>
-void Report(const char* format, Args... args)
+template <typename... Args> void Report(const char* format, Args... args)
 {
     if (hostServices != nullptr && hostServices->ReportError != nullptr)
         hostServices->ReportError(1, format, args...);
@@ -205,12 +204,23 @@ void UndoEscapes(char* value)
         if (next == '\0')
             break;
         switch (next) {
-        case 'n': *write++ = '\n'; break;
-        case 'r': *write++ = '\r'; break;
-        case 't': *write++ = '\t'; break;
-        case '"': *write++ = '"'; break;
-        case '\\': *write++ = '\\'; break;
-        default: break;
+        case 'n':
+            *write++ = '\n';
+            break;
+        case 'r':
+            *write++ = '\r';
+            break;
+        case 't':
+            *write++ = '\t';
+            break;
+        case '"':
+            *write++ = '"';
+            break;
+        case '\\':
+            *write++ = '\\';
+            break;
+        default:
+            break;
         }
         read += 2;
     }
@@ -251,7 +261,7 @@ void ReplaceQuotAndAmp(char* value)
     }
 }
 
-} // namespace
+}  // namespace
 
 // ---------------------------------------------------------------------------
 // [SECTION] Creation and files
@@ -300,7 +310,8 @@ bool XmlReader::Open(const char* filePath)
 
     // Positions are signed 32-bit: a file beyond that is not a data file.
     const int64_t fileSize = file->size;
-    char* text = fileSize >= 0 && fileSize < INT32_MAX ? AllocateText(static_cast<size_t>(fileSize) + 1) : nullptr;
+    char* text =
+        fileSize >= 0 && fileSize < INT32_MAX ? AllocateText(static_cast<size_t>(fileSize) + 1) : nullptr;
     if (text == nullptr) {
         files->FileClose(file);
         return false;
@@ -338,9 +349,8 @@ bool XmlReader::AcceptText(char* text, int64_t textSize)
         char* plain = nullptr;
         if (size == int64_t{envelope::kHeaderSize} + payloadLength)
             plain = AllocateText(static_cast<size_t>(payloadLength) + 1);
-        if (plain != nullptr &&
-            envelope::Descramble(bytes + envelope::kHeaderSize, payloadLength,
-                                 reinterpret_cast<unsigned char*>(plain)) != checksum) {
+        if (plain != nullptr && envelope::Descramble(bytes + envelope::kHeaderSize, payloadLength,
+                                                     reinterpret_cast<unsigned char*>(plain)) != checksum) {
             FreeText(plain);
             plain = nullptr;
         }
@@ -392,8 +402,9 @@ bool XmlReader::ReadDeclaration()
     if (found) {
         const unsigned char first = text[position];
         if (first != '<') {
-            Report("First non-whitespace char in XML document needs to be '<'. First char in '%s' is #%d '%c'.",
-                   path, static_cast<int>(first), static_cast<int>(first));
+            Report(
+                "First non-whitespace char in XML document needs to be '<'. First char in '%s' is #%d '%c'.",
+                path, static_cast<int>(first), static_cast<int>(first));
             return false;
         }
         // The bytes between '<' and "?>" are not looked at: any first tag will do.
@@ -618,7 +629,8 @@ char* XmlReader::ReadToken(XmlBlock& target)
                         return token;
                     }
                 }
-                if (n > 3 && last == '-' && token[n - 2] == '-' && token[n - 3] == '!' && token[n - 4] == '<') {
+                if (n > 3 && last == '-' && token[n - 2] == '-' && token[n - 3] == '!' &&
+                    token[n - 4] == '<') {
                     // A comment: c is consumed, the "<!--" taken back, and the reader
                     // stays in the tag with what the token held before it.
                     n -= 4;
@@ -859,6 +871,6 @@ void XmlReader::ReportParseError(const char* reason, int character)
     // The character goes out as a plain (signed) char promoted to int, so a byte
     // above 127 prints in hex as a negative number would, e.g. ffffffe9.
     const int promoted = static_cast<signed char>(character);
-    Report("Parsing error (%s) around line %d in XML '%s'. Unexpected character '%c' (%x) at:\n'%s'", reason, line,
-           path, promoted, static_cast<unsigned>(promoted), excerpt);
+    Report("Parsing error (%s) around line %d in XML '%s'. Unexpected character '%c' (%x) at:\n'%s'", reason,
+           line, path, promoted, static_cast<unsigned>(promoted), excerpt);
 }

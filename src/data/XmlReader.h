@@ -21,11 +21,11 @@
 struct XmlBlock {
     static constexpr int32_t kMaxAttributes = 512;
 
-    char* name;                               // element name; null for a text block
-    int32_t count;                            // attributes; 1 for a text block
-    char* attributeNames[kMaxAttributes];     // text block: "DATA" or "CDATA"
-    char* attributeValues[kMaxAttributes];    // text block: the text
-    bool closing;                             // close tag or self-closing tag
+    char* name;                             // element name; null for a text block
+    int32_t count;                          // attributes; 1 for a text block
+    char* attributeNames[kMaxAttributes];   // text block: "DATA" or "CDATA"
+    char* attributeValues[kMaxAttributes];  // text block: the text
+    bool closing;                           // close tag or self-closing tag
 };
 
 class XmlReader {

@@ -76,14 +76,12 @@ public:
     }
 
     // A value-initialised object / block of `n` value-initialised elements.
-    template <typename T>
-    T* Create()
+    template <typename T> T* Create()
     {
         static_assert(alignof(T) <= kObjectAlignment, "over-aligned objects need a heap of their own");
         return new (AllocateObject(sizeof(T))) T();
     }
-    template <typename T>
-    T* CreateBlock(int32_t n)
+    template <typename T> T* CreateBlock(int32_t n)
     {
         static_assert(alignof(T) <= kObjectAlignment, "over-aligned objects need a heap of their own");
         T* block = static_cast<T*>(AllocateObject(sizeof(T) * static_cast<size_t>(n > 0 ? n : 0)));
@@ -104,14 +102,14 @@ public:
 private:
     struct Chunk {
         Chunk* next;
-        size_t size;    // usable bytes behind the header
+        size_t size;  // usable bytes behind the header
     };
     static_assert(sizeof(Chunk) % kObjectAlignment == 0, "blocks behind the header keep the alignment");
     struct Lane {
         Chunk* chunks = nullptr;
         char* cursor = nullptr;
         char* limit = nullptr;
-        size_t nextSize = 0;     // payload of the next regular chunk
+        size_t nextSize = 0;  // payload of the next regular chunk
     };
 
     // Payload of the first regular chunk of a lane, and the most a lane grows to.

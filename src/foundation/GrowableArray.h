@@ -21,8 +21,7 @@ inline int32_t GrownArrayCapacity(int32_t count, int32_t capacity)
     return doubled >= int64_t{count} + 1 ? static_cast<int32_t>(doubled) : count + 1;
 }
 
-template <typename Element>
-class GrowableArray {
+template <typename Element> class GrowableArray {
 public:
     // The first block holds this many, whatever the element.
     static constexpr int32_t kFirstCapacity = 32;
@@ -89,8 +88,7 @@ private:
         void Free(Element*) const {}
     };
 
-    template <typename Blocks>
-    void Grow(const Element& item, Blocks blocks)
+    template <typename Blocks> void Grow(const Element& item, Blocks blocks)
     {
         if (count + 1 <= capacity) {
             data[count++] = item;
@@ -110,8 +108,7 @@ private:
         blocks.Free(old);
     }
 
-    template <typename Blocks>
-    void Resize(int32_t n, Blocks blocks)
+    template <typename Blocks> void Resize(int32_t n, Blocks blocks)
     {
         if (n == capacity)
             return;

@@ -22,7 +22,7 @@ bool PointsInto(const char* pointer, const char* begin, int32_t length)
     return address >= start && address < start + static_cast<uintptr_t>(length);
 }
 
-} // namespace
+}  // namespace
 
 InlineString::~InlineString()
 {

@@ -3,8 +3,7 @@
 
 #include "foundation/GrowableArray.h"
 
-template <typename T>
-class PtrArray : public GrowableArray<T*> {
+template <typename T> class PtrArray : public GrowableArray<T*> {
 public:
     using Base = GrowableArray<T*>;
 
@@ -32,8 +31,7 @@ public:
     // most a quarter of the block is used. An emptied array keeps its block.
     void Shrink()
     {
-        if (!this->autoShrink || this->data == nullptr || this->count < 1 ||
-            this->count > this->capacity / 4)
+        if (!this->autoShrink || this->data == nullptr || this->count < 1 || this->count > this->capacity / 4)
             return;
         const int32_t half = this->capacity / 2;
         if (half != this->capacity)

@@ -10,7 +10,7 @@ namespace {
 // Most texts the module formats are short; longer ones take a second pass.
 constexpr int32_t kStackFormatSize = 4096;
 
-} // namespace
+}  // namespace
 
 char* DuplicateText(const char* text)
 {

@@ -11,7 +11,7 @@ void* PlainAllocate(size_t size)
 
 TextAllocateFunction textAllocate = PlainAllocate;
 
-} // namespace
+}  // namespace
 
 char* AllocateText(size_t size)
 {

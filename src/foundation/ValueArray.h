@@ -10,8 +10,7 @@
 
 #include "foundation/GrowableArray.h"
 
-template <typename Record>
-class ValueArray : public GrowableArray<Record> {
+template <typename Record> class ValueArray : public GrowableArray<Record> {
     static_assert(std::is_trivially_copyable<Record>::value,
                   "elements move between blocks bytewise and are released unvisited");
 };

@@ -19,7 +19,12 @@ public:
     virtual void Shutdown() = 0;
     virtual bool IsOverlayActive() { return false; }
     virtual void Update() = 0;
-    virtual const char* Command(const char* name, const char* argument) { (void)name; (void)argument; return nullptr; }
+    virtual const char* Command(const char* name, const char* argument)
+    {
+        (void)name;
+        (void)argument;
+        return nullptr;
+    }
     virtual BaseImplementation* GetImplementation(int32_t serviceNumber) = 0;
 };
 

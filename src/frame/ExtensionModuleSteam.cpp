@@ -55,11 +55,14 @@ const char* ExtensionModuleSteam::Command(const char* name, const char* argument
 BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumber)
 {
     switch (serviceNumber) {
-    case kServiceCloud: return cloud;
-    case kServiceAchievements: return achievements;
+    case kServiceCloud:
+        return cloud;
+    case kServiceAchievements:
+        return achievements;
     // Store (4), leaderboards (2) and workshop (6) are not built yet: their
     // fields stay null, as before a successful Initialize.
-    default: return nullptr;
+    default:
+        return nullptr;
     }
 }
 

@@ -16,39 +16,15 @@ struct Language {
 };
 
 const Language kLanguages[] = {
-    {"arabic", "ar"},
-    {nullptr, "bn"},
-    {"bulgarian", "bg"},
-    {"schinese", "zh-CN"},
-    {"tchinese", "zh-TW"},
-    {"czech", "cs"},
-    {"danish", "da"},
-    {"dutch", "nl"},
-    {"english", "en"},
-    {"finnish", "fi"},
-    {"french", "fr"},
-    {"greek", "el"},
-    {"german", "de"},
-    {nullptr, "hi"},
-    {"hungarian", "hu"},
-    {nullptr, "id"},
-    {"italian", "it"},
-    {"japanese", "ja"},
-    {"koreana", "ko"},  // the platform's word for Korean ends in "a"
-    {"norwegian", "no"},
-    {"polish", "pl"},
-    {"portuguese", "pt"},
-    {"brazilian", "pt-BR"},
-    {nullptr, "pa"},
-    {"romanian", "ro"},
-    {"russian", "ru"},
-    {"spanish", "es"},
-    {"swedish", "sv"},
-    {"thai", "th"},
-    {"turkish", "tr"},
-    {"ukrainian", "uk"},
-    {nullptr, "ur"},
-    {"vietnamese", "vi"},
+    {"arabic", "ar"},      {nullptr, "bn"},      {"bulgarian", "bg"},  {"schinese", "zh-CN"},
+    {"tchinese", "zh-TW"}, {"czech", "cs"},      {"danish", "da"},     {"dutch", "nl"},
+    {"english", "en"},     {"finnish", "fi"},    {"french", "fr"},     {"greek", "el"},
+    {"german", "de"},      {nullptr, "hi"},      {"hungarian", "hu"},  {nullptr, "id"},
+    {"italian", "it"},     {"japanese", "ja"},   {"koreana", "ko"},  // the platform's word for Korean ends in "a"
+    {"norwegian", "no"},   {"polish", "pl"},     {"portuguese", "pt"}, {"brazilian", "pt-BR"},
+    {nullptr, "pa"},       {"romanian", "ro"},   {"russian", "ru"},    {"spanish", "es"},
+    {"swedish", "sv"},     {"thai", "th"},       {"turkish", "tr"},    {"ukrainian", "uk"},
+    {nullptr, "ur"},       {"vietnamese", "vi"},
 };
 constexpr int32_t kLanguageCount = sizeof kLanguages / sizeof kLanguages[0];
 static_assert(kLanguageCount == 33, "the module numbers 33 languages");

@@ -29,8 +29,7 @@ extern "C" void S_CALLTYPE SteamWarningHook(int severity, const char* text)
 // The destructor, run at exit, unregisters the callback if it is still registered.
 SteamManager steamManager;
 
-SteamManager::SteamManager()
-    : overlayCallback(this, &SteamManager::OnOverlayActivated)
+SteamManager::SteamManager() : overlayCallback(this, &SteamManager::OnOverlayActivated)
 {
     initialised = false;
     overlayActive = false;

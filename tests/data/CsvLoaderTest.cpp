@@ -21,7 +21,7 @@ std::string Text(const char* text)
 struct CsvLoad {
     bool loaded = false;
     int arrays = 0;
-    std::vector<std::string> nodes;   // "a=1,b=2", null as "~"
+    std::vector<std::string> nodes;  // "a=1,b=2", null as "~"
     std::vector<std::string> logs;
     std::vector<std::string> reports;
     int reads = 0;
@@ -124,4 +124,4 @@ TEST(CsvLoader, OneReadPerByteAndMissingFile)
     EXPECT_TRUE(missing.logs.empty());
 }
 
-} // namespace
+}  // namespace

@@ -20,7 +20,8 @@ simengine::Engine& FreshEngine()
     return engine;
 }
 
-const std::string kGood = "<?xml version=\"1.0\"?><root><array id=\"A\"><node id=\"n\" v=\"1\"/></array></root>";
+const std::string kGood =
+    "<?xml version=\"1.0\"?><root><array id=\"A\"><node id=\"n\" v=\"1\"/></array></root>";
 
 int OpensOf(simengine::Engine& engine, const std::string& path)
 {
@@ -137,4 +138,4 @@ TEST(DataCache, MutexPerRequestAndLoadOutsideIt)
     EXPECT_TRUE(popupSawUnlocked());
 }
 
-} // namespace
+}  // namespace

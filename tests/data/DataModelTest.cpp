@@ -32,7 +32,9 @@ TEST(HashText, Values)
         {"DATA", 3536562},
         {"\xff", 255},
         {"\xff\x80", 9563},
-        {"\x80" "abc", 6620102},
+        {"\x80"
+         "abc",
+         6620102},
         {"zzzzzzzzzz", 3689885900u},
         {"leaderboards/leaderboards.xml", 1999625986u},
     };
@@ -77,7 +79,7 @@ TEST(Database, SetPathNeverLeavesNull)
 
 struct LookupRow {
     const char* name;
-    const char* expected; // null: nothing found
+    const char* expected;  // null: nothing found
 };
 
 const char* Show(const char* text)
@@ -99,15 +101,9 @@ TEST(DataNode, GetValue)
     ASSERT_EQ(node.values.count, 7);
 
     const LookupRow rows[] = {
-        {"id", "node-1"},
-        {"", "empty-name"},
-        {"name", "first"},
-        {"Name", nullptr},
-        {"novalue", nullptr},
-        {"missing", nullptr},
-        {kCollideA, "collide"},
-        {kCollideB, nullptr},
-        {nullptr, nullptr},
+        {"id", "node-1"},       {"", "empty-name"},   {"name", "first"},
+        {"Name", nullptr},      {"novalue", nullptr}, {"missing", nullptr},
+        {kCollideA, "collide"}, {kCollideB, nullptr}, {nullptr, nullptr},
     };
     for (const LookupRow& row : rows) {
         SCOPED_TRACE(Show(row.name));
@@ -169,15 +165,15 @@ TEST(DataArray, FindNode)
     x2->SetId("x");
     DataNode* collide = array->AddNode();
     collide->SetId(kCollideA);
-    array->nodes.Add(nullptr);                // a hole is skipped, here and at destruction
+    array->nodes.Add(nullptr);  // a hole is skipped, here and at destruction
 
     struct Row {
         const char* id;
         const DataNode* expected;
     };
     const Row rows[] = {
-        {"", emptyId}, {"x", x1}, {"X", nullptr}, {kCollideA, collide},
-        {kCollideB, nullptr}, {"missing", nullptr}, {nullptr, nullptr},
+        {"", emptyId},        {"x", x1},          {"X", nullptr}, {kCollideA, collide}, {kCollideB, nullptr},
+        {"missing", nullptr}, {nullptr, nullptr},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(Show(row.id));
@@ -274,4 +270,4 @@ TEST(Database, ClearKeepsPathAndBlock)
     EXPECT_NE(database.FindArray("again"), nullptr);
 }
 
-} // namespace
+}  // namespace

@@ -132,4 +132,4 @@ TEST(TreeMemory, ArenaTreeKeepsTheRulesOfTheHeapTree)
     EXPECT_STREQ(array->name.text, "named");
 }
 
-} // namespace
+}  // namespace

@@ -72,25 +72,30 @@ Load LoadFile(const std::string& bytes, std::vector<std::optional<std::string>> 
 
 std::string M1(const char* name)
 {
-    return std::string("DataManager: XML database needs to be contained within 'root' block (not expecting '") + name +
-           "'). 'd.xml' is invalid.";
+    return std::string(
+               "DataManager: XML database needs to be contained within 'root' block (not expecting '") +
+           name + "'). 'd.xml' is invalid.";
 }
 const std::string M2 = "DataManager: XML database needs to end with root block closing. 'd.xml' is invalid.";
 const std::string M3 = "DataManager: No blocks can exist after </root>. 'd.xml' is invalid.";
 std::string M4(const char* name)
 {
-    return std::string("DataManager: root/array/node structure violated. '") + name + "' is not 'array'. 'd.xml' is invalid.";
+    return std::string("DataManager: root/array/node structure violated. '") + name +
+           "' is not 'array'. 'd.xml' is invalid.";
 }
 const std::string M5 = "DataManager: File 'd.xml' ends unexpectedly. Not loaded.";
 const std::string M6 = "DataManager: File 'd.xml' has enclosing arrays which is not supported. Not loaded.";
 std::string M7(const char* name)
 {
-    return std::string("DataManager: in 'd.xml' is expecting to find two types of elements inside root: 'array' and "
-                       "'node'. '") + name + "' is not one of them.";
+    return std::string(
+               "DataManager: in 'd.xml' is expecting to find two types of elements inside root: 'array' and "
+               "'node'. '") +
+           name + "' is not one of them.";
 }
 std::string M8(int count, const char* id)
 {
-    return "DataManager: error parsing file 'd.xml' after node #" + std::to_string(count) + " with id '" + id + "'.";
+    return "DataManager: error parsing file 'd.xml' after node #" + std::to_string(count) + " with id '" +
+           id + "'.";
 }
 std::string M9(int count, const char* id)
 {
@@ -99,8 +104,8 @@ std::string M9(int count, const char* id)
 
 struct Row {
     const char* name;
-    std::string body;   // behind the declaration
-    std::string tree;   // "" for a refused file
+    std::string body;  // behind the declaration
+    std::string tree;  // "" for a refused file
     std::vector<std::string> reports;
 };
 
@@ -114,20 +119,39 @@ TEST(XmlLoader, Shapes)
         {"smallest", "<root></root>", "", {}},
         {"self-closing array creates nothing", "<root><array id=\"A\"/></root>", "", {}},
         {"empty array", A + Z, "A()[]", {}},
-        {"array pairs, last id and value win", "<root><array id=\"A\" x=\"1\" id=\"B\" x=\"2\" y=\"3\"></array></root>", "B(x=2,y=3)[]", {}},
+        {"array pairs, last id and value win",
+         "<root><array id=\"A\" x=\"1\" id=\"B\" x=\"2\" y=\"3\"></array></root>",
+         "B(x=2,y=3)[]",
+         {}},
         {"array without id", "<root><array></array></root>", "~()[]", {}},
-        {"node forms alike", A + "<node id=\"a\"></node><node id=\"a\"/><node id=\"a\"> </node>" + Z, "A()[a:id=a|a:id=a|a:id=a]", {}},
+        {"node forms alike",
+         A + "<node id=\"a\"></node><node id=\"a\"/><node id=\"a\"> </node>" + Z,
+         "A()[a:id=a|a:id=a|a:id=a]",
+         {}},
         {"node text", A + "<node id=\"a\">hello</node>" + Z, "A()[a:id=a,DATA=hello]", {}},
         {"node cdata", A + "<node id=\"a\"><![CDATA[x<y]]></node>" + Z, "A()[a:id=a,CDATA=x<y]", {}},
-        {"block behind text dropped unseen", A + "<node id=\"a\">x<node id=\"b\"/>" + Z, "A()[a:id=a,DATA=x]", {}},
-        {"open node then self-closing node with attributes", A + "<node id=\"a\"><node id=\"b\" c=\"d\"/>" + Z, "A()[a:id=a|b:id=b,c=d]", {}},
+        {"block behind text dropped unseen",
+         A + "<node id=\"a\">x<node id=\"b\"/>" + Z,
+         "A()[a:id=a,DATA=x]",
+         {}},
+        {"open node then self-closing node with attributes",
+         A + "<node id=\"a\"><node id=\"b\" c=\"d\"/>" + Z,
+         "A()[a:id=a|b:id=b,c=d]",
+         {}},
         {"self-closing node ends at </array>", A + "<node id=\"a\"/>" + Z, "A()[a:id=a]", {}},
         {"stray </node> is a node", A + "</node>" + Z, "A()[~:]", {}},
         {"node without id", A + "<node v=\"1\"/>" + Z, "A()[~:v=1]", {}},
         {"repeated id: last is the id", A + "<node id=\"a\" id=\"b\"/>" + Z, "A()[b:id=a,id=b]", {}},
-        {"two arrays and </array> at top level", A + Z.substr(0, 8) + "</array><array id=\"B\"><node id=\"x\"/>" + Z, "A()[] B()[x:id=x]", {}},
+        {"two arrays and </array> at top level",
+         A + Z.substr(0, 8) + "</array><array id=\"B\"><node id=\"x\"/>" + Z,
+         "A()[] B()[x:id=x]",
+         {}},
         {"text behind </root> at the end", "<root></root>\ntail", "", {}},
-        {"parse error behind </root>", "<root></root>>", "", {"Parsing error (not expecting '>') around line 2 in XML 'd.xml'. Unexpected character '>' (3e) at:\n'>'"}},
+        {"parse error behind </root>",
+         "<root></root>>",
+         "",
+         {"Parsing error (not expecting '>') around line 2 in XML 'd.xml'. Unexpected character '>' (3e) "
+          "at:\n'>'"}},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.name);
@@ -164,10 +188,18 @@ TEST(XmlLoader, Refusals)
         {"M7 </root> inside an array", A + "</root>", "", {M7("root")}},
         {"M7 second text behind a node", A + "<node id=\"a\">one</node>two<node/>" + Z, "", {M7("null")}},
         {"M8 no block behind node", A + "<node id=\"a\">\n", "", {M8(1, "a")}},
-        {"M8 counts over arrays, null id", A + "<node id=\"a\"/></array><array><node/><node>\n", "", {M8(3, "null")}},
+        {"M8 counts over arrays, null id",
+         A + "<node id=\"a\"/></array><array><node/><node>\n",
+         "",
+         {M8(3, "null")}},
         {"M9 open node then </array>", A + "<node id=\"a\"></array></root>", "", {M9(1, "a")}},
         {"M9 open node then open node", A + "<node id=\"a\"><node id=\"b\">" + Z, "", {M9(1, "a")}},
-        {"parse error then M5", A + "<<", "", {"Parsing error (not expecting another '<') around line 2 in XML 'd.xml'. Unexpected character '<' (3c) at:\n'<'", M5}},
+        {"parse error then M5",
+         A + "<<",
+         "",
+         {"Parsing error (not expecting another '<') around line 2 in XML 'd.xml'. Unexpected character '<' "
+          "(3c) at:\n'<'",
+          M5}},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.name);
@@ -183,8 +215,9 @@ TEST(XmlLoader, EveryPrefixOfAValidFileFails)
 {
     // Catches a loader that accepts a truncated file, or crashes on one; the full
     // file up to and behind "</root>" loads.
-    const std::string file = kDecl + "<root>\n <array id=\"A\" k=\"v\">\n  <node id=\"a\" x=\"&quot;1\\n\">t</node>\n"
-                                     "  <!-- c --><node id=\"b\"/>\n  <node><![CDATA[z]]></node>\n </array>\n</root>\n";
+    const std::string file =
+        kDecl + "<root>\n <array id=\"A\" k=\"v\">\n  <node id=\"a\" x=\"&quot;1\\n\">t</node>\n"
+                "  <!-- c --><node id=\"b\"/>\n  <node><![CDATA[z]]></node>\n </array>\n</root>\n";
     const size_t complete = file.find("</root>") + 7;
     for (size_t length = 0; length <= file.size(); ++length) {
         SCOPED_TRACE(length);
@@ -257,7 +290,8 @@ TEST(ScrambledEnvelope, KnownBytes)
         text[i] = static_cast<char>(i * 7);
     std::vector<unsigned char> scrambled(text.size());
     std::vector<unsigned char> back(text.size());
-    const uint32_t sum = envelope::Scramble(reinterpret_cast<const unsigned char*>(text.data()), 600, scrambled.data());
+    const uint32_t sum =
+        envelope::Scramble(reinterpret_cast<const unsigned char*>(text.data()), 600, scrambled.data());
     EXPECT_EQ(envelope::Descramble(scrambled.data(), 600, back.data()), sum);
     EXPECT_EQ(std::string(back.begin(), back.end()), text);
     // Index 13 wraps to key byte 0, index 256 adds 0: a zero stored byte there
@@ -275,7 +309,8 @@ TEST(ScrambledEnvelope, ReadByContent)
     // header check that looks at fewer bytes than the magic and its terminator.
     const std::string good = kDecl + "<root><array id=\"A\"></array></root>";
     const std::string envelopeBytes = Envelope(good);
-    const std::string notFound = "XML document needs to start with line like <?xml versions=... ?>. File 'd.xml' doesn't.";
+    const std::string notFound =
+        "XML document needs to start with line like <?xml versions=... ?>. File 'd.xml' doesn't.";
     std::string oneMore = envelopeBytes + "x";
     std::string oneLess = envelopeBytes.substr(0, envelopeBytes.size() - 1);
     std::string negative = envelopeBytes;
@@ -299,9 +334,13 @@ TEST(ScrambledEnvelope, ReadByContent)
         {"negative length", negative, false, {}},
         {"changed stored byte", changedLate, false, {}},
         {"empty payload", Envelope(""), false, {notFound}},
-        {"other 14th byte is plain", otherTerminator, false,
+        {"other 14th byte is plain",
+         otherTerminator,
+         false,
          {"First non-whitespace char in XML document needs to be '<'. First char in 'd.xml' is #77 'M'."}},
-        {"21 bytes with the magic is plain", shortMagic, false,
+        {"21 bytes with the magic is plain",
+         shortMagic,
+         false,
          {"First non-whitespace char in XML document needs to be '<'. First char in 'd.xml' is #77 'M'."}},
     };
     for (const EnvelopeRow& row : rows) {
@@ -316,8 +355,10 @@ TEST(ScrambledEnvelope, ReadByContent)
     // text ('<' of the declaration becomes '=').
     std::string firstByte = envelopeBytes;
     firstByte[envelope::kHeaderSize] = static_cast<char>(firstByte[envelope::kHeaderSize] + 1);
-    EXPECT_EQ(LoadFile(firstByte).reports,
-              (std::vector<std::string>{"First non-whitespace char in XML document needs to be '<'. First char in 'd.xml' is #61 '='."}));
+    EXPECT_EQ(
+        LoadFile(firstByte).reports,
+        (std::vector<std::string>{
+            "First non-whitespace char in XML document needs to be '<'. First char in 'd.xml' is #61 '='."}));
 }
 
 TEST(XmlLoader, ShortReadAndFailedOpen)
@@ -335,4 +376,4 @@ TEST(XmlLoader, ShortReadAndFailedOpen)
     EXPECT_EQ(engine.Records().All().Logs(simengine::LogKind::Report)[0].text, M2);
 }
 
-} // namespace
+}  // namespace

@@ -58,16 +58,16 @@ ReadResult ReadAll(const std::string& text)
 std::string ParseError(const std::string& reason, int line, char character, const std::string& excerpt)
 {
     char text[1024];
-    std::snprintf(text, sizeof text,
-                  "Parsing error (%s) around line %d in XML 't.xml'. Unexpected character '%c' (%x) at:\n'%s'",
-                  reason.c_str(), line, character, static_cast<unsigned>(static_cast<int>(character)),
-                  excerpt.c_str());
+    std::snprintf(
+        text, sizeof text,
+        "Parsing error (%s) around line %d in XML 't.xml'. Unexpected character '%c' (%x) at:\n'%s'",
+        reason.c_str(), line, character, static_cast<unsigned>(static_cast<int>(character)), excerpt.c_str());
     return std::string(text, std::strlen(text));
 }
 
 struct Row {
     const char* name;
-    std::string body;                     // behind the declaration
+    std::string body;  // behind the declaration
     std::vector<std::string> blocks;
     std::vector<std::string> reports;
 };
@@ -145,24 +145,54 @@ TEST(XmlReaderErrors, EveryRefusal)
 {
     // Catches a wrong reason, character, line or excerpt, and a reader that goes on
     // reading after a refusal.
-    const std::string expectQuote =
-        "Expecting \" character to start value definition (all values must be defined name=\"value\" with quotes).";
+    const std::string expectQuote = "Expecting \" character to start value definition (all values must be "
+                                    "defined name=\"value\" with quotes).";
     const Row rows[] = {
         {"> in text", "\n>", {}, {ParseError("not expecting '>'", 2, '>', ">")}},
         {"<< in a tag", "<<a>", {}, {ParseError("not expecting another '<'", 1, '<', "<a>")}},
         {"<> in a tag", "<>", {}, {ParseError("not expecting '<' yet", 1, '>', ">")}},
-        {"nothing between values", "<a b=\"c\"d=\"e\">", {}, {ParseError("Unexpected character after value definition.", 1, 'd', "\"d=\"e\">")}},
-        {"quoted word then a letter in text", "x \"y\"z<a>", {}, {ParseError("Unexpected character after value definition.", 1, 'z', "\"z<a>")}},
+        {"nothing between values",
+         "<a b=\"c\"d=\"e\">",
+         {},
+         {ParseError("Unexpected character after value definition.", 1, 'd', "\"d=\"e\">")}},
+        {"quoted word then a letter in text",
+         "x \"y\"z<a>",
+         {},
+         {ParseError("Unexpected character after value definition.", 1, 'z', "\"z<a>")}},
         // A byte above 127 prints in hex as the promoted plain char: ffffffe9.
-        {"quoted word then a high byte", "x \"y\"\xe9<a>", {}, {ParseError("Unexpected character after value definition.", 1, '\xe9', "\"\xe9<a>")}},
+        {"quoted word then a high byte",
+         "x \"y\"\xe9<a>",
+         {},
+         {ParseError("Unexpected character after value definition.", 1, '\xe9', "\"\xe9<a>")}},
         {"no =", "<a b>\n", {}, {ParseError("Reading next block (case #1)", 1, '\0', ">\n")}},
-        {"digit first in a name", "<a 1b=\"c\">\n", {}, {ParseError("Reading next block (case #1)", 1, '\0', ">\n")}},
-        {"no quotes", "<a b=c>\n", {}, {ParseError(expectQuote, 1, 'c', ">\n"), ParseError("Reading next block (case #2)", 2, '\0', "\n")}},
-        {"single quotes", "<a b='c'>x", {}, {ParseError(expectQuote, 1, '\'', ">x"), ParseError("Reading next block (case #2)", 1, '\0', "x")}},
-        {"unended cdata", "<a><![CDATA[x", {"a"}, {ParseError("'![CDATA[' does not end with ']]>' pattern.", 1, ' ', "![CDATA[x")}},
-        {"nested comment", "<a>\n<!-- <!-- -->", {"a"}, {ParseError("New comment block start within a comment block.", 2, '<', " <!-- -->")}},
-        {"unended comment", "<a><!-- xy", {"a"}, {ParseError("Comment block not ended properly.", 1, ' ', "- xy")}},
-        {"blocks before the error are given", "<a><b>\n\n<<", {"a", "b"}, {ParseError("not expecting another '<'", 3, '<', "<")}},
+        {"digit first in a name",
+         "<a 1b=\"c\">\n",
+         {},
+         {ParseError("Reading next block (case #1)", 1, '\0', ">\n")}},
+        {"no quotes",
+         "<a b=c>\n",
+         {},
+         {ParseError(expectQuote, 1, 'c', ">\n"), ParseError("Reading next block (case #2)", 2, '\0', "\n")}},
+        {"single quotes",
+         "<a b='c'>x",
+         {},
+         {ParseError(expectQuote, 1, '\'', ">x"), ParseError("Reading next block (case #2)", 1, '\0', "x")}},
+        {"unended cdata",
+         "<a><![CDATA[x",
+         {"a"},
+         {ParseError("'![CDATA[' does not end with ']]>' pattern.", 1, ' ', "![CDATA[x")}},
+        {"nested comment",
+         "<a>\n<!-- <!-- -->",
+         {"a"},
+         {ParseError("New comment block start within a comment block.", 2, '<', " <!-- -->")}},
+        {"unended comment",
+         "<a><!-- xy",
+         {"a"},
+         {ParseError("Comment block not ended properly.", 1, ' ', "- xy")}},
+        {"blocks before the error are given",
+         "<a><b>\n\n<<",
+         {"a", "b"},
+         {ParseError("not expecting another '<'", 3, '<', "<")}},
     };
     for (const Row& row : rows)
         Check(row);
@@ -229,7 +259,8 @@ TEST(XmlReaderDeclaration, StartOfText)
 {
     // Catches the two start messages swapped, a byte order mark not skipped, and a
     // cursor left inside the declaration.
-    const std::string noDeclaration = "XML document needs to start with line like <?xml versions=... ?>. File 't.xml' doesn't.";
+    const std::string noDeclaration =
+        "XML document needs to start with line like <?xml versions=... ?>. File 't.xml' doesn't.";
     struct DeclRow {
         const char* name;
         std::string text;
@@ -242,8 +273,18 @@ TEST(XmlReaderDeclaration, StartOfText)
         {"empty", "", false, {noDeclaration}, {}, ""},
         {"whitespace", " \n\t ", false, {noDeclaration}, {}, ""},
         {"one byte <", "<", false, {noDeclaration}, {}, ""},
-        {"starts with x", "xml", false, {"First non-whitespace char in XML document needs to be '<'. First char in 't.xml' is #120 'x'."}, {}, ""},
-        {"byte above 127", "\xe9<", false, {"First non-whitespace char in XML document needs to be '<'. First char in 't.xml' is #233 '\xe9'."}, {}, ""},
+        {"starts with x",
+         "xml",
+         false,
+         {"First non-whitespace char in XML document needs to be '<'. First char in 't.xml' is #120 'x'."},
+         {},
+         ""},
+        {"byte above 127",
+         "\xe9<",
+         false,
+         {"First non-whitespace char in XML document needs to be '<'. First char in 't.xml' is #233 '\xe9'."},
+         {},
+         ""},
         {"no ?>", "<root></root>", false, {noDeclaration}, {}, ""},
         {"?> right behind <", "<?><a>", false, {noDeclaration}, {}, ""},
         {"any first tag will do", "<zz ?><a>", true, {}, {"a"}, ""},
@@ -272,8 +313,15 @@ TEST(XmlReaderEntities, ReplaceEntities)
         const char* out;
     };
     const EntityRow rows[] = {
-        {"", ""}, {"&", "&"}, {"&quot;", "\""}, {"&amp;", "&"}, {"&amp;quot;", "&quot;"},
-        {"&quot;&quot;x", "\"\"x"}, {"&amp;amp;", "&amp;"}, {"&lt;&gt;&#34;", "&lt;&gt;&#34;"}, {"&quot", "&quot"},
+        {"", ""},
+        {"&", "&"},
+        {"&quot;", "\""},
+        {"&amp;", "&"},
+        {"&amp;quot;", "&quot;"},
+        {"&quot;&quot;x", "\"\"x"},
+        {"&amp;amp;", "&amp;"},
+        {"&lt;&gt;&#34;", "&lt;&gt;&#34;"},
+        {"&quot", "&quot"},
     };
     for (const EntityRow& row : rows) {
         SCOPED_TRACE(row.in);
@@ -283,4 +331,4 @@ TEST(XmlReaderEntities, ReplaceEntities)
     }
 }
 
-} // namespace
+}  // namespace

@@ -61,7 +61,7 @@ TEST(PtrArray, GrowthSteps)
 {
     struct Row {
         const char* name;
-        int32_t reserve; // -1: none
+        int32_t reserve;  // -1: none
         int adds;
         int32_t capacity;
     };
@@ -125,12 +125,12 @@ TEST(PtrArray, Reserve)
     // Catches a Reserve that drops elements when asked for less than count.
     PtrArray<int> array;
     array.Reserve(0);
-    EXPECT_EQ(array.data, nullptr);           // equal to capacity: nothing at all
+    EXPECT_EQ(array.data, nullptr);  // equal to capacity: nothing at all
 
     Fill(array, 10);
     int** block = array.data;
     array.Reserve(32);
-    EXPECT_EQ(array.data, block);             // equal to capacity: no new block
+    EXPECT_EQ(array.data, block);  // equal to capacity: no new block
 
     array.Reserve(4);
     EXPECT_EQ(array.capacity, 10);
@@ -151,10 +151,8 @@ TEST(PtrArray, Shrink)
         int32_t capacity;
     };
     const Row rows[] = {
-        {"off changes nothing", false, 8, 32},
-        {"a quarter halves", true, 8, 16},
-        {"over a quarter stays", true, 9, 32},
-        {"one element halves", true, 1, 16},
+        {"off changes nothing", false, 8, 32},    {"a quarter halves", true, 8, 16},
+        {"over a quarter stays", true, 9, 32},    {"one element halves", true, 1, 16},
         {"emptied keeps its block", true, 0, 32},
     };
     for (const Row& row : rows) {
@@ -180,8 +178,8 @@ TEST(PtrArray, Removal)
     EXPECT_EQ(array.IndexOf(Slot(50)), -1);
     EXPECT_TRUE(array.Remove(Slot(1)));
     EXPECT_FALSE(array.Remove(Slot(1)));
-    array.RemoveAt(3);                        // Slot(4)
-    array.RemoveAt(7);                        // out of range: nothing
+    array.RemoveAt(3);  // Slot(4)
+    array.RemoveAt(7);  // out of range: nothing
     ASSERT_EQ(array.count, 3);
     EXPECT_EQ(array.data[0], Slot(0));
     EXPECT_EQ(array.data[1], Slot(2));
@@ -225,4 +223,4 @@ TEST(ValueArray, NewBlocksAreConstructedAndMovesKeepFields)
     }
 }
 
-} // namespace
+}  // namespace

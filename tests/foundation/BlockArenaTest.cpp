@@ -136,4 +136,4 @@ TEST(BlockArena, TextHeapExhaustionGivesNullTextsButObjects)
     EXPECT_EQ(*object, 0);
 }
 
-} // namespace
+}  // namespace

@@ -7,7 +7,12 @@
 
 class CountingTextHeap {
 public:
-    CountingTextHeap() { SetTextAllocator(&Allocate); allocations = 0; failFrom = -1; }
+    CountingTextHeap()
+    {
+        SetTextAllocator(&Allocate);
+        allocations = 0;
+        failFrom = -1;
+    }
     ~CountingTextHeap() { SetTextAllocator(nullptr); }
 
     // Every allocation from now on gives null.

@@ -21,7 +21,8 @@ TEST(InlineString, FirstAssignPlacesByLength)
         bool inlineExpected;
         int32_t capacity;
     };
-    const Row rows[] = {{0, true, 15}, {1, true, 15}, {14, true, 15}, {15, false, 15}, {16, false, 16}, {300, false, 300}};
+    const Row rows[] = {{0, true, 15},   {1, true, 15},   {14, true, 15},
+                        {15, false, 15}, {16, false, 16}, {300, false, 300}};
     for (const Row& row : rows) {
         SCOPED_TRACE(row.length);
         const std::string source(row.length, 'x');
@@ -88,7 +89,7 @@ TEST(InlineString, GrowingNeverReusesTheBlockEvenWithRoom)
     CountingTextHeap heap;
     InlineString s;
     s.Assign(std::string(100, 'a').c_str());
-    s.Assign("0123456789");                 // in place: 90 shorter
+    s.Assign("0123456789");  // in place: 90 shorter
     ASSERT_FALSE(IsInline(s));
     EXPECT_EQ(s.capacity, 100);
     const int before = heap.Allocations();
@@ -97,7 +98,7 @@ TEST(InlineString, GrowingNeverReusesTheBlockEvenWithRoom)
     EXPECT_EQ(heap.Allocations(), before);
     EXPECT_STREQ(s.text, "0123456789ab");
 
-    s.Assign(std::string(20, 'c').c_str()); // longer than 12: a new exact block
+    s.Assign(std::string(20, 'c').c_str());  // longer than 12: a new exact block
     EXPECT_FALSE(IsInline(s));
     EXPECT_EQ(s.capacity, 20);
     EXPECT_EQ(heap.Allocations(), before + 1);
@@ -187,7 +188,7 @@ TEST(InlineString, CopiesAreIndependent)
     InlineString c;
     c.Assign(std::string(30, 'z').c_str());
     char* block = c.text;
-    c = a;                                  // shorter by 25: overwritten in place
+    c = a;  // shorter by 25: overwritten in place
     EXPECT_EQ(c.text, block);
     a.Assign("other");
     EXPECT_STREQ(b.text, "short");
@@ -208,11 +209,11 @@ TEST(InlineString, HeapExhaustionLeavesNoText)
     EXPECT_EQ(s.text, nullptr);
     EXPECT_EQ(s.length, 0);
 
-    s.Assign("fits inline");                // needs no heap
+    s.Assign("fits inline");  // needs no heap
     EXPECT_STREQ(s.text, "fits inline");
     s.Append("!");
     EXPECT_EQ(s.text, nullptr);
     EXPECT_EQ(s.length, 0);
 }
 
-} // namespace
+}  // namespace

@@ -12,35 +12,24 @@ struct TokenRow {
     const char* list;
     const char* separator;
     int32_t index;
-    const char* expected; // null: no token
+    const char* expected;  // null: no token
 };
 
 TEST(GetListToken, Tokens)
 {
     // Catches an off-by-one in the walk, a set-of-characters separator, and the trailing rule.
     const TokenRow rows[] = {
-        {"a,b", ",", 0, "a"},
-        {"a,b", ",", 1, "b"},
-        {"a,b", ",", 2, nullptr},
-        {"a,b,", ",", 2, ""},
-        {"a,b,", ",", 3, ""},
-        {"a,b,", ",", 50, ""},
-        {"a,b,", ",", -1, ""},
-        {"a,b", ",", -1, nullptr},
-        {"", ",", 0, ""},
-        {"", ",", 1, nullptr},
-        {",b", ",", 0, ""},
-        {"a,,c", ",", 1, ""},
-        {"a,,c", ",", 2, "c"},
-        {"a::b", "::", 1, "b"},
-        {"a::b", "::", 0, "a"},
-        {"a:b::c", "::", 0, "a:b"},
-        {"a:b::c", ":", 1, "b"},
-        {"one;two;three", ";", 2, "three"},
-        {"abc", "", 0, ""},
-        {"abc", "", 5, ""},
-        {"abc", "", -1, ""},
-        {"buy,item1", ",", 1, "item1"},
+        {"a,b", ",", 0, "a"},     {"a,b", ",", 1, "b"},
+        {"a,b", ",", 2, nullptr}, {"a,b,", ",", 2, ""},
+        {"a,b,", ",", 3, ""},     {"a,b,", ",", 50, ""},
+        {"a,b,", ",", -1, ""},    {"a,b", ",", -1, nullptr},
+        {"", ",", 0, ""},         {"", ",", 1, nullptr},
+        {",b", ",", 0, ""},       {"a,,c", ",", 1, ""},
+        {"a,,c", ",", 2, "c"},    {"a::b", "::", 1, "b"},
+        {"a::b", "::", 0, "a"},   {"a:b::c", "::", 0, "a:b"},
+        {"a:b::c", ":", 1, "b"},  {"one;two;three", ";", 2, "three"},
+        {"abc", "", 0, ""},       {"abc", "", 5, ""},
+        {"abc", "", -1, ""},      {"buy,item1", ",", 1, "item1"},
     };
     for (const TokenRow& row : rows) {
         SCOPED_TRACE(std::string(row.list) + " [" + row.separator + "] #" + std::to_string(row.index));
@@ -99,4 +88,4 @@ TEST(GetListToken, TrailingSeparatorWithNoRoom)
     EXPECT_EQ(buffer[1], kMarker);
 }
 
-} // namespace
+}  // namespace

@@ -114,4 +114,4 @@ TEST(FormatString, AroundTheStackBuffer)
     }
 }
 
-} // namespace
+}  // namespace

@@ -27,18 +27,24 @@ TEST_F(CommandChannel, WithTheClientGoneEveryCommandAnswersNull)
     world.SetSteamRunning(false);
     world.ClearJournal();
     const std::pair<const char*, const char*> commands[] = {
-        {"Steam", "RunCallbacks"},         {"OpenStoreWithAppId", "440"},
-        {"GetPlayerOnlineID", nullptr},    {"GetServerTime", nullptr},
-        {"GameCenter", "IsAvailable"},     {"GameCenter", "UnlockAchievement,WIN"},
-        {"GameCenter", "GetStatisticsInt,kills"}, {"GetLanguage", nullptr}, {"GetBranchName", nullptr},
+        {"Steam", "RunCallbacks"},
+        {"OpenStoreWithAppId", "440"},
+        {"GetPlayerOnlineID", nullptr},
+        {"GetServerTime", nullptr},
+        {"GameCenter", "IsAvailable"},
+        {"GameCenter", "UnlockAchievement,WIN"},
+        {"GameCenter", "GetStatisticsInt,kills"},
+        {"GetLanguage", nullptr},
+        {"GetBranchName", nullptr},
     };
     for (const auto& [name, argument] : commands) {
         SCOPED_TRACE(name);
         EXPECT_EQ(Run(name, argument), std::nullopt);
     }
     std::vector<std::string> afterRunningCheck = world.GetJournal().Names();
-    afterRunningCheck.erase(std::remove(afterRunningCheck.begin(), afterRunningCheck.end(), "SteamAPI_IsSteamRunning"),
-                            afterRunningCheck.end());
+    afterRunningCheck.erase(
+        std::remove(afterRunningCheck.begin(), afterRunningCheck.end(), "SteamAPI_IsSteamRunning"),
+        afterRunningCheck.end());
     EXPECT_TRUE(afterRunningCheck.empty()) << afterRunningCheck.front();
     EXPECT_TRUE(OpenedUrls().empty());
 }

@@ -15,7 +15,10 @@ std::string CodeFor(const char* word)
 
 TEST(LanguageMapping, EveryPlatformWordReachesItsCode)
 {
-    struct Row { const char* word; const char* code; };
+    struct Row {
+        const char* word;
+        const char* code;
+    };
     const Row rows[] = {
         {"arabic", "ar"},     {"bulgarian", "bg"}, {"schinese", "zh-CN"}, {"tchinese", "zh-TW"},
         {"czech", "cs"},      {"danish", "da"},    {"dutch", "nl"},       {"english", "en"},
@@ -44,7 +47,10 @@ TEST(LanguageMapping, UnknownWordsFallBackToEnglish)
 
 TEST(LanguageMapping, NumbersWithoutPlatformWordKeepTheirCodes)
 {
-    struct Row { int number; const char* code; };
+    struct Row {
+        int number;
+        const char* code;
+    };
     const Row rows[] = {{1, "bn"}, {13, "hi"}, {15, "id"}, {23, "pa"}, {31, "ur"}, {0, "ar"}, {32, "vi"}};
     for (const Row& row : rows) {
         SCOPED_TRACE(row.number);

@@ -32,14 +32,16 @@ TEST_F(ModuleLifecycle, ExportGivesOneObjectEvenWhenCallsRace)
     ASSERT_TRUE(loader.Unload());
     void* library = dlopen(STEAMEXT_MODULE_PATH, RTLD_NOW | RTLD_LOCAL);
     ASSERT_NE(library, nullptr);
-    auto entry = reinterpret_cast<GetExtensionModuleInterfaceFn>(dlsym(library, "OB_GetExtensionModuleInterface"));
+    auto entry =
+        reinterpret_cast<GetExtensionModuleInterfaceFn>(dlsym(library, "OB_GetExtensionModuleInterface"));
     ASSERT_NE(entry, nullptr);
     std::vector<ExtensionModule*> seen(8);
     std::atomic<bool> go{false};
     std::vector<std::thread> racers;
     for (size_t i = 0; i < seen.size(); ++i)
         racers.emplace_back([&, i] {
-            while (!go) {}
+            while (!go) {
+            }
             seen[i] = entry();
         });
     go = true;
@@ -123,7 +125,9 @@ TEST_F(ModuleLifecycle, StartUpFailures)
         std::vector<std::pair<int32_t, std::string>> logs;  // level, text (info lines as 0)
     };
     const Row rows[] = {
-        {"client absent, init fails", false, false,
+        {"client absent, init fails",
+         false,
+         false,
          {{0, "Initializing Steam.."}, {1, "Steam still not running."}, {2, "Steam Init failed."}}},
         {"client running, init fails", true, false, {{0, "Initializing Steam.."}, {2, "Steam Init failed."}}},
     };

@@ -10,8 +10,7 @@
 
 namespace {
 
-template <class Result, class... Args>
-Result CallSlot(void* object, int slot, Args... args)
+template <class Result, class... Args> Result CallSlot(void* object, int slot, Args... args)
 {
     void** table = *reinterpret_cast<void***>(object);
     using Function = Result (*)(void*, Args...);

@@ -17,14 +17,13 @@ using nlohmann::json;
 TEST(JsonLocator, FindsNestedValuesAndSkipsTrickyStrings)
 {
     // Brackets, commas and escaped quotes inside strings must not move positions.
-    const std::string text =
-        "{\n"
-        "  \"a\": \"x,]}\\\"[\",\n"
-        "  \"steps\": [\n"
-        "    {\"call\": \"C\", \"args\": [1, {\"k\\\"ey\": null}]},\n"
-        "    [ ]\n"
-        "  ]\n"
-        "}\n";
+    const std::string text = "{\n"
+                             "  \"a\": \"x,]}\\\"[\",\n"
+                             "  \"steps\": [\n"
+                             "    {\"call\": \"C\", \"args\": [1, {\"k\\\"ey\": null}]},\n"
+                             "    [ ]\n"
+                             "  ]\n"
+                             "}\n";
     JsonLocator locator(text);
     struct Row {
         const char* pointer;
@@ -117,7 +116,10 @@ TEST(Expectations, LogsAndCallsAreCheckedInOrder)
         std::vector<json> calls;
         int failed;
     } rows[] = {
-        {"in order with gaps", {json{{"text", "a"}}, json{{"text", "b"}}}, {json{{"name", "X"}}, json{{"name", "Y"}}}, 0},
+        {"in order with gaps",
+         {json{{"text", "a"}}, json{{"text", "b"}}},
+         {json{{"name", "X"}}, json{{"name", "Y"}}},
+         0},
         {"logs out of order", {json{{"text", "b"}}, json{{"text", "a"}}}, {}, 1},
         {"a call that never came", {}, {json{{"name", "Z"}}}, 1},
         {"counted", {}, {json{{"name", "X"}, {"count", 2}}, json{{"name", "Y"}, {"count", 1}}}, 0},
@@ -183,18 +185,22 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
         const char* text;
         const char* message;
     } rows[] = {
-        {"{\"steps\": [{\"call\": \"Command\", \"args\": [1]}]}", "t.json:1:41: steps[0].args[0]: expected a string or null"},
+        {"{\"steps\": [{\"call\": \"Command\", \"args\": [1]}]}",
+         "t.json:1:41: steps[0].args[0]: expected a string or null"},
         {"{\"steps\": [{\"call\": \"cloud.WriteFile\", \"args\": {\"name\": \"a\", \"dat\": \"b\"}}]}",
          "steps[0].args.dat: \"cloud.WriteFile\" has no argument \"dat\""},
-        {"{\"steps\": [{\"call\": \"GetName\", \"expect\": 3}]}", "steps[0].expect: expected a string, got an integer"},
+        {"{\"steps\": [{\"call\": \"GetName\", \"expect\": 3}]}",
+         "steps[0].expect: expected a string, got an integer"},
         {"{\"steps\": [{\"frames\": 1, \"expect\": true}]}", "needs \"call\" in the same step"},
         {"{\"steps\": [{\"wait_for\": {\"event\": 17, \"log\": \"x\"}}]}", "wait for exactly one thing"},
         {"{\"steps\": [{\"logs\": [{}]}]}", "steps[0].logs[0]: an empty pattern matches anything"},
         {"{\"steps\": [{\"inputs\": {\"keys\": \"1\"}}]}", "steps[0].inputs.keys: unknown key"},
         {"{\"steps\": [{}]}", "steps[0]: an empty step"},
         {"{\"engine\": {\"clock\": \"fast\"}, \"steps\": []}", "engine.clock: the clock is"},
-        {"{\"engine\": {\"clock\": \"manual\", \"time_scale\": 4}, \"steps\": []}", "only applies to the \"scaled\" clock"},
-        {"{\"world\": {\"user\": {\"steam_id\": -4}}, \"steps\": []}", "world.user.steam_id: expected a non-negative"},
+        {"{\"engine\": {\"clock\": \"manual\", \"time_scale\": 4}, \"steps\": []}",
+         "only applies to the \"scaled\" clock"},
+        {"{\"world\": {\"user\": {\"steam_id\": -4}}, \"steps\": []}",
+         "world.user.steam_id: expected a non-negative"},
         {"{\"world\": {\"server_time\": 1.5}, \"steps\": []}", "world.server_time: expected seconds"},
         {"[1, 2]", "t.json:1:1: (top level): expected an object"},
         {"{\"steps\": [}", "t.json:1:12: not valid JSON"},
@@ -220,7 +226,7 @@ TEST(ScenarioParser, FillsDefaultsAndSizes)
         "t.json", ".");
     ASSERT_EQ(s.steps.size(), 3u);
     EXPECT_EQ(s.steps[0].args[1].bytes, std::string("\0\1\2", 3));
-    EXPECT_EQ(s.steps[0].args[2].number, 3);  // the size follows the data
+    EXPECT_EQ(s.steps[0].args[2].number, 3);            // the size follows the data
     EXPECT_FALSE(s.steps[1].args[1].text.has_value());  // an omitted argument is null
     EXPECT_EQ(s.steps[2].args[0].number, 0);
     EXPECT_EQ(*s.steps[2].args[1].text, "ACH");

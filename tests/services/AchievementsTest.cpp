@@ -32,7 +32,10 @@ protected:
 
 TEST_F(Achievements, StoreComesOnlyAfterMoreThanTwentySeconds)
 {
-    struct Row { uint32_t advance; size_t stores; };
+    struct Row {
+        uint32_t advance;
+        size_t stores;
+    };
     const Row rows[] = {{19999, 0}, {20000, 0}, {20001, 1}};
     for (const Row& row : rows) {
         SCOPED_TRACE(row.advance);

@@ -69,7 +69,11 @@ TEST_F(Cloud, EmptyFileGivesAnEmptyBufferNotNull)
     HostBuffer* buffer = cloud->ReadFile("empty");
     ASSERT_NE(buffer, nullptr);
     EXPECT_EQ(buffer->size, 0u);
-    EXPECT_EQ(world.GetJournal().Calls("FileRead").at(0).args.substr(world.GetJournal().Calls("FileRead").at(0).args.size() - 1), "0");
+    EXPECT_EQ(world.GetJournal()
+                  .Calls("FileRead")
+                  .at(0)
+                  .args.substr(world.GetJournal().Calls("FileRead").at(0).args.size() - 1),
+              "0");
     engine.Table()->ReleaseBuffer(buffer);
 }
 

@@ -11,118 +11,131 @@ using OverlayCallback = CCallback<OverlayCatch, GameOverlayActivated_t>;
 
 class Dispatch : public SimWorld {};
 
-TEST_F(Dispatch, LatencyCountsPumps) {
-  struct Row { const char* name; int latency; int extra; int deliveredAtPump; };
-  const Row rows[] = {
-      {"default latency", 1, 0, 1},
-      {"three pumps", 3, 0, 3},
-      {"fault adds two", 1, 2, 3},
-  };
-  for (const Row& row : rows) {
-    SCOPED_TRACE(row.name);
-    world.SetLatency(row.latency);
-    if (row.extra)
-      world.InjectFault("RequestCurrentStats", simclient::Fault::ExtraLatency(row.extra));
-    using Catch = Catcher<UserStatsReceived_t>;
-    Catch c;
-    CCallback<Catch, UserStatsReceived_t> cb(&c, &Catch::OnCallback);
-    ASSERT_TRUE(SteamUserStats()->RequestCurrentStats());
-    EXPECT_EQ(c.calls, 0) << "delivered outside the pump";
-    for (int pump = 1; pump <= row.deliveredAtPump; ++pump) {
-      EXPECT_EQ(c.calls, 0) << "before pump " << pump;
-      SteamAPI_RunCallbacks();
+TEST_F(Dispatch, LatencyCountsPumps)
+{
+    struct Row {
+        const char* name;
+        int latency;
+        int extra;
+        int deliveredAtPump;
+    };
+    const Row rows[] = {
+        {"default latency", 1, 0, 1},
+        {"three pumps", 3, 0, 3},
+        {"fault adds two", 1, 2, 3},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        world.SetLatency(row.latency);
+        if (row.extra)
+            world.InjectFault("RequestCurrentStats", simclient::Fault::ExtraLatency(row.extra));
+        using Catch = Catcher<UserStatsReceived_t>;
+        Catch c;
+        CCallback<Catch, UserStatsReceived_t> cb(&c, &Catch::OnCallback);
+        ASSERT_TRUE(SteamUserStats()->RequestCurrentStats());
+        EXPECT_EQ(c.calls, 0) << "delivered outside the pump";
+        for (int pump = 1; pump <= row.deliveredAtPump; ++pump) {
+            EXPECT_EQ(c.calls, 0) << "before pump " << pump;
+            SteamAPI_RunCallbacks();
+        }
+        EXPECT_EQ(c.calls, 1);
+        EXPECT_EQ(c.last.m_eResult, k_EResultOK);
+        EXPECT_EQ(c.last.m_nGameID, 480u);
     }
+}
+
+TEST_F(Dispatch, BroadcastReachesEveryRegisteredObjectWithItsPayload)
+{
+    OverlayCatch a, b;
+    OverlayCallback ca(&a, &OverlayCatch::OnCallback), cb(&b, &OverlayCatch::OnCallback);
+    world.SetOverlayActive(true);
+    world.SetOverlayActive(false);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(a.calls, 2);
+    EXPECT_EQ(b.calls, 2);
+    EXPECT_EQ(a.last.m_bActive, 0);
+}
+
+TEST_F(Dispatch, NothingIsDeliveredWhileNotInitialised)
+{
+    OverlayCatch c;
+    OverlayCallback cb(&c, &OverlayCatch::OnCallback);
+    SteamAPI_Shutdown();
+    world.SetOverlayActive(true);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(c.calls, 0);
+    ASSERT_TRUE(SteamAPI_Init());
+    SteamAPI_RunCallbacks();
     EXPECT_EQ(c.calls, 1);
-    EXPECT_EQ(c.last.m_eResult, k_EResultOK);
-    EXPECT_EQ(c.last.m_nGameID, 480u);
-  }
 }
 
-TEST_F(Dispatch, BroadcastReachesEveryRegisteredObjectWithItsPayload) {
-  OverlayCatch a, b;
-  OverlayCallback ca(&a, &OverlayCatch::OnCallback), cb(&b, &OverlayCatch::OnCallback);
-  world.SetOverlayActive(true);
-  world.SetOverlayActive(false);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(a.calls, 2);
-  EXPECT_EQ(b.calls, 2);
-  EXPECT_EQ(a.last.m_bActive, 0);
-}
-
-TEST_F(Dispatch, NothingIsDeliveredWhileNotInitialised) {
-  OverlayCatch c;
-  OverlayCallback cb(&c, &OverlayCatch::OnCallback);
-  SteamAPI_Shutdown();
-  world.SetOverlayActive(true);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.calls, 0);
-  ASSERT_TRUE(SteamAPI_Init());
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.calls, 1);
-}
-
-TEST_F(Dispatch, RegistrationBeforeInitIsKept) {
-  SteamAPI_Shutdown();
-  world.Reset();
-  OverlayCatch c;
-  OverlayCallback cb(&c, &OverlayCatch::OnCallback);  // as at library load
-  ASSERT_TRUE(SteamAPI_Init());
-  world.SetOverlayActive(true);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.calls, 1);
+TEST_F(Dispatch, RegistrationBeforeInitIsKept)
+{
+    SteamAPI_Shutdown();
+    world.Reset();
+    OverlayCatch c;
+    OverlayCallback cb(&c, &OverlayCatch::OnCallback);  // as at library load
+    ASSERT_TRUE(SteamAPI_Init());
+    world.SetOverlayActive(true);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(c.calls, 1);
 }
 
 // A handler that destroys another registered object must not get it called afterwards.
 struct Destroyer {
-  std::unique_ptr<OverlayCallback> victim;
-  int calls = 0;
-  void OnCallback(GameOverlayActivated_t*) {
-    ++calls;
-    victim.reset();
-  }
+    std::unique_ptr<OverlayCallback> victim;
+    int calls = 0;
+    void OnCallback(GameOverlayActivated_t*)
+    {
+        ++calls;
+        victim.reset();
+    }
 };
 
-TEST_F(Dispatch, HandlerMayDestroyOtherCallbacks) {
-  Destroyer d;
-  OverlayCatch c;
-  CCallback<Destroyer, GameOverlayActivated_t> first(&d, &Destroyer::OnCallback);
-  d.victim = std::make_unique<OverlayCallback>(&c, &OverlayCatch::OnCallback);
-  world.SetOverlayActive(true);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(d.calls, 1);
-  EXPECT_EQ(c.calls, 0);
+TEST_F(Dispatch, HandlerMayDestroyOtherCallbacks)
+{
+    Destroyer d;
+    OverlayCatch c;
+    CCallback<Destroyer, GameOverlayActivated_t> first(&d, &Destroyer::OnCallback);
+    d.victim = std::make_unique<OverlayCallback>(&c, &OverlayCatch::OnCallback);
+    world.SetOverlayActive(true);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(d.calls, 1);
+    EXPECT_EQ(c.calls, 0);
 }
 
 struct SelfRemover {
-  std::unique_ptr<CCallback<SelfRemover, GameOverlayActivated_t>> self;
-  int calls = 0;
-  void OnCallback(GameOverlayActivated_t*) {
-    ++calls;
-    self->Unregister();
-  }
+    std::unique_ptr<CCallback<SelfRemover, GameOverlayActivated_t>> self;
+    int calls = 0;
+    void OnCallback(GameOverlayActivated_t*)
+    {
+        ++calls;
+        self->Unregister();
+    }
 };
 
-TEST_F(Dispatch, HandlerMayUnregisterItself) {
-  SelfRemover r;
-  r.self = std::make_unique<CCallback<SelfRemover, GameOverlayActivated_t>>(
-      &r, &SelfRemover::OnCallback);
-  world.SetOverlayActive(true);
-  world.SetOverlayActive(false);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(r.calls, 1);
+TEST_F(Dispatch, HandlerMayUnregisterItself)
+{
+    SelfRemover r;
+    r.self = std::make_unique<CCallback<SelfRemover, GameOverlayActivated_t>>(&r, &SelfRemover::OnCallback);
+    world.SetOverlayActive(true);
+    world.SetOverlayActive(false);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(r.calls, 1);
 }
 
-TEST_F(Dispatch, ShutdownDropsPendingResults) {
-  Catcher<LeaderboardFindResult_t> c;
-  CCallResult<Catcher<LeaderboardFindResult_t>, LeaderboardFindResult_t> result;
-  result.Set(SteamUserStats()->FindOrCreateLeaderboard("x", k_ELeaderboardSortMethodAscending,
-                                                       k_ELeaderboardDisplayTypeNumeric),
-             &c, &Catcher<LeaderboardFindResult_t>::OnResult);
-  SteamAPI_Shutdown();
-  ASSERT_TRUE(SteamAPI_Init());
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.calls, 0);
-  EXPECT_EQ(world.PendingCount(), 0u);
+TEST_F(Dispatch, ShutdownDropsPendingResults)
+{
+    Catcher<LeaderboardFindResult_t> c;
+    CCallResult<Catcher<LeaderboardFindResult_t>, LeaderboardFindResult_t> result;
+    result.Set(SteamUserStats()->FindOrCreateLeaderboard("x", k_ELeaderboardSortMethodAscending,
+                                                         k_ELeaderboardDisplayTypeNumeric),
+               &c, &Catcher<LeaderboardFindResult_t>::OnResult);
+    SteamAPI_Shutdown();
+    ASSERT_TRUE(SteamAPI_Init());
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(c.calls, 0);
+    EXPECT_EQ(world.PendingCount(), 0u);
 }
 
 }  // namespace

@@ -9,90 +9,99 @@ using simclient::Fault;
 
 class FaultsAndJournal : public SimWorld {};
 
-SteamAPICall_t Find() {
-  return SteamUserStats()->FindOrCreateLeaderboard("b", k_ELeaderboardSortMethodDescending,
-                                                   k_ELeaderboardDisplayTypeNumeric);
+SteamAPICall_t Find()
+{
+    return SteamUserStats()->FindOrCreateLeaderboard("b", k_ELeaderboardSortMethodDescending,
+                                                     k_ELeaderboardDisplayTypeNumeric);
 }
 
-TEST_F(FaultsAndJournal, ZeroHandleAppliesOnceAfterSkip) {
-  world.InjectFault("FindOrCreateLeaderboard", Fault::ZeroHandle().Skip(1));
-  EXPECT_NE(Find(), k_uAPICallInvalid);
-  EXPECT_EQ(Find(), k_uAPICallInvalid);
-  EXPECT_NE(Find(), k_uAPICallInvalid);
+TEST_F(FaultsAndJournal, ZeroHandleAppliesOnceAfterSkip)
+{
+    world.InjectFault("FindOrCreateLeaderboard", Fault::ZeroHandle().Skip(1));
+    EXPECT_NE(Find(), k_uAPICallInvalid);
+    EXPECT_EQ(Find(), k_uAPICallInvalid);
+    EXPECT_NE(Find(), k_uAPICallInvalid);
 }
 
-TEST_F(FaultsAndJournal, AlwaysKeepsFailingUntilCleared) {
-  world.InjectFault("FileWrite", Fault::Fail().Always());
-  EXPECT_FALSE(SteamRemoteStorage()->FileWrite("a", "x", 1));
-  EXPECT_FALSE(SteamRemoteStorage()->FileWrite("a", "x", 1));
-  world.ClearFaults();
-  EXPECT_TRUE(SteamRemoteStorage()->FileWrite("a", "x", 1));
+TEST_F(FaultsAndJournal, AlwaysKeepsFailingUntilCleared)
+{
+    world.InjectFault("FileWrite", Fault::Fail().Always());
+    EXPECT_FALSE(SteamRemoteStorage()->FileWrite("a", "x", 1));
+    EXPECT_FALSE(SteamRemoteStorage()->FileWrite("a", "x", 1));
+    world.ClearFaults();
+    EXPECT_TRUE(SteamRemoteStorage()->FileWrite("a", "x", 1));
 }
 
-TEST_F(FaultsAndJournal, ShortRead) {
-  world.PutFile("f", {1, 2, 3, 4, 5});
-  world.InjectFault("FileRead", Fault::ShortRead(3));
-  uint8 out[5] = {};
-  EXPECT_EQ(SteamRemoteStorage()->FileRead("f", out, 5), 3);
-  EXPECT_EQ(SteamRemoteStorage()->FileRead("f", out, 5), 5);
+TEST_F(FaultsAndJournal, ShortRead)
+{
+    world.PutFile("f", {1, 2, 3, 4, 5});
+    world.InjectFault("FileRead", Fault::ShortRead(3));
+    uint8 out[5] = {};
+    EXPECT_EQ(SteamRemoteStorage()->FileRead("f", out, 5), 3);
+    EXPECT_EQ(SteamRemoteStorage()->FileRead("f", out, 5), 5);
 }
 
-TEST_F(FaultsAndJournal, ResultCodeAndDrop) {
-  using Catch = Catcher<UserStatsReceived_t>;
-  Catch c;
-  CCallback<Catch, UserStatsReceived_t> cb(&c, &Catch::OnCallback);
-  world.InjectFault("RequestCurrentStats", Fault::Result(k_EResultTimeout));
-  ASSERT_TRUE(SteamUserStats()->RequestCurrentStats());
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.last.m_eResult, k_EResultTimeout);
+TEST_F(FaultsAndJournal, ResultCodeAndDrop)
+{
+    using Catch = Catcher<UserStatsReceived_t>;
+    Catch c;
+    CCallback<Catch, UserStatsReceived_t> cb(&c, &Catch::OnCallback);
+    world.InjectFault("RequestCurrentStats", Fault::Result(k_EResultTimeout));
+    ASSERT_TRUE(SteamUserStats()->RequestCurrentStats());
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(c.last.m_eResult, k_EResultTimeout);
 
-  Catcher<LeaderboardFindResult_t> r;
-  CCallResult<Catcher<LeaderboardFindResult_t>, LeaderboardFindResult_t> result;
-  world.InjectFault("FindOrCreateLeaderboard", Fault::Drop());
-  SteamAPICall_t h = Find();
-  EXPECT_NE(h, k_uAPICallInvalid);
-  result.Set(h, &r, &Catcher<LeaderboardFindResult_t>::OnResult);
-  for (int i = 0; i < 5; ++i) SteamAPI_RunCallbacks();
-  EXPECT_EQ(r.calls, 0);
-  EXPECT_TRUE(result.IsActive());
+    Catcher<LeaderboardFindResult_t> r;
+    CCallResult<Catcher<LeaderboardFindResult_t>, LeaderboardFindResult_t> result;
+    world.InjectFault("FindOrCreateLeaderboard", Fault::Drop());
+    SteamAPICall_t h = Find();
+    EXPECT_NE(h, k_uAPICallInvalid);
+    result.Set(h, &r, &Catcher<LeaderboardFindResult_t>::OnResult);
+    for (int i = 0; i < 5; ++i)
+        SteamAPI_RunCallbacks();
+    EXPECT_EQ(r.calls, 0);
+    EXPECT_TRUE(result.IsActive());
 }
 
-TEST_F(FaultsAndJournal, InitCanBeFailedByFault) {
-  SteamAPI_Shutdown();
-  world.InjectFault("SteamAPI_Init", Fault::Fail());
-  EXPECT_FALSE(SteamAPI_Init());
-  EXPECT_TRUE(SteamAPI_Init());
+TEST_F(FaultsAndJournal, InitCanBeFailedByFault)
+{
+    SteamAPI_Shutdown();
+    world.InjectFault("SteamAPI_Init", Fault::Fail());
+    EXPECT_FALSE(SteamAPI_Init());
+    EXPECT_TRUE(SteamAPI_Init());
 }
 
-TEST_F(FaultsAndJournal, JournalKeepsOrderArgumentsAndThread) {
-  SteamRemoteStorage()->FileWrite("name", "ab", 2);
-  SteamUserStats()->GetStat("s", static_cast<int32*>(nullptr));
-  SteamAPI_RunCallbacks();
-  simclient::Journal j = world.GetJournal();
-  EXPECT_EQ(j.Names(), (std::vector<std::string>{"FileWrite", "GetStat", "SteamAPI_RunCallbacks"}));
-  EXPECT_EQ(j.Calls("FileWrite")[0].args, "\"name\", 2");
-  EXPECT_EQ(j.Calls("FileWrite")[0].thread, std::this_thread::get_id());
-  EXPECT_TRUE(j.CalledBefore("FileWrite", "SteamAPI_RunCallbacks"));
-  EXPECT_FALSE(j.CalledBefore("SteamAPI_RunCallbacks", "FileWrite"));
-  EXPECT_EQ(j.IndexOf("StoreStats"), -1);
-  EXPECT_EQ(j.Count("GetStat"), 1u);
+TEST_F(FaultsAndJournal, JournalKeepsOrderArgumentsAndThread)
+{
+    SteamRemoteStorage()->FileWrite("name", "ab", 2);
+    SteamUserStats()->GetStat("s", static_cast<int32*>(nullptr));
+    SteamAPI_RunCallbacks();
+    simclient::Journal j = world.GetJournal();
+    EXPECT_EQ(j.Names(), (std::vector<std::string>{"FileWrite", "GetStat", "SteamAPI_RunCallbacks"}));
+    EXPECT_EQ(j.Calls("FileWrite")[0].args, "\"name\", 2");
+    EXPECT_EQ(j.Calls("FileWrite")[0].thread, std::this_thread::get_id());
+    EXPECT_TRUE(j.CalledBefore("FileWrite", "SteamAPI_RunCallbacks"));
+    EXPECT_FALSE(j.CalledBefore("SteamAPI_RunCallbacks", "FileWrite"));
+    EXPECT_EQ(j.IndexOf("StoreStats"), -1);
+    EXPECT_EQ(j.Count("GetStat"), 1u);
 }
 
-TEST_F(FaultsAndJournal, ResetKeepsRegistrationsOnly) {
-  using Catch = Catcher<GameOverlayActivated_t>;
-  Catch c;
-  CCallback<Catch, GameOverlayActivated_t> cb(&c, &Catch::OnCallback);
-  world.InjectFault("FileWrite", Fault::Fail());
-  world.PutFile("x", {1});
-  world.Reset();
-  EXPECT_FALSE(world.IsInitialised());
-  EXPECT_FALSE(world.File("x").has_value());
-  EXPECT_EQ(world.GetJournal().Size(), 0u);
-  ASSERT_TRUE(SteamAPI_Init());
-  EXPECT_TRUE(SteamRemoteStorage()->FileWrite("a", "x", 1)) << "fault survived Reset";
-  world.SetOverlayActive(true);
-  SteamAPI_RunCallbacks();
-  EXPECT_EQ(c.calls, 1);
+TEST_F(FaultsAndJournal, ResetKeepsRegistrationsOnly)
+{
+    using Catch = Catcher<GameOverlayActivated_t>;
+    Catch c;
+    CCallback<Catch, GameOverlayActivated_t> cb(&c, &Catch::OnCallback);
+    world.InjectFault("FileWrite", Fault::Fail());
+    world.PutFile("x", {1});
+    world.Reset();
+    EXPECT_FALSE(world.IsInitialised());
+    EXPECT_FALSE(world.File("x").has_value());
+    EXPECT_EQ(world.GetJournal().Size(), 0u);
+    ASSERT_TRUE(SteamAPI_Init());
+    EXPECT_TRUE(SteamRemoteStorage()->FileWrite("a", "x", 1)) << "fault survived Reset";
+    world.SetOverlayActive(true);
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(c.calls, 1);
 }
 
 }  // namespace

@@ -51,28 +51,30 @@ CHECK_OFFSET(SteamUGCDetails_t, m_unNumChildren, 9760);
 CHECK_SIZE(RemoteStorageSubscribePublishedFileResult_t, 12);
 CHECK_SIZE(PersonaStateChange_t, 12);
 
-TEST(Layout, CallbackNumbers) {
-  EXPECT_EQ(GameOverlayActivated_t::k_iCallback, 331);
-  EXPECT_EQ(PersonaStateChange_t::k_iCallback, 304);
-  EXPECT_EQ(UserStatsReceived_t::k_iCallback, 1101);
-  EXPECT_EQ(UserStatsStored_t::k_iCallback, 1102);
-  EXPECT_EQ(UserAchievementStored_t::k_iCallback, 1103);
-  EXPECT_EQ(LeaderboardFindResult_t::k_iCallback, 1104);
-  EXPECT_EQ(LeaderboardScoresDownloaded_t::k_iCallback, 1105);
-  EXPECT_EQ(LeaderboardScoreUploaded_t::k_iCallback, 1106);
-  EXPECT_EQ(RemoteStorageSubscribePublishedFileResult_t::k_iCallback, 1313);
-  EXPECT_EQ(RemoteStorageUnsubscribePublishedFileResult_t::k_iCallback, 1315);
-  EXPECT_EQ(SteamUGCQueryCompleted_t::k_iCallback, 3401);
-  EXPECT_EQ(CreateItemResult_t::k_iCallback, 3403);
-  EXPECT_EQ(SubmitItemUpdateResult_t::k_iCallback, 3404);
+TEST(Layout, CallbackNumbers)
+{
+    EXPECT_EQ(GameOverlayActivated_t::k_iCallback, 331);
+    EXPECT_EQ(PersonaStateChange_t::k_iCallback, 304);
+    EXPECT_EQ(UserStatsReceived_t::k_iCallback, 1101);
+    EXPECT_EQ(UserStatsStored_t::k_iCallback, 1102);
+    EXPECT_EQ(UserAchievementStored_t::k_iCallback, 1103);
+    EXPECT_EQ(LeaderboardFindResult_t::k_iCallback, 1104);
+    EXPECT_EQ(LeaderboardScoresDownloaded_t::k_iCallback, 1105);
+    EXPECT_EQ(LeaderboardScoreUploaded_t::k_iCallback, 1106);
+    EXPECT_EQ(RemoteStorageSubscribePublishedFileResult_t::k_iCallback, 1313);
+    EXPECT_EQ(RemoteStorageUnsubscribePublishedFileResult_t::k_iCallback, 1315);
+    EXPECT_EQ(SteamUGCQueryCompleted_t::k_iCallback, 3401);
+    EXPECT_EQ(CreateItemResult_t::k_iCallback, 3403);
+    EXPECT_EQ(SubmitItemUpdateResult_t::k_iCallback, 3404);
 }
 
-TEST(Layout, SteamIdBitFields) {
-  CSteamID id(42u, k_EUniversePublic, k_EAccountTypeIndividual);
-  EXPECT_EQ(id.ConvertToUint64(), 76561197960265728ull + 42);
-  EXPECT_EQ(id.GetAccountID(), 42u);
-  EXPECT_EQ(id.GetUnAccountInstance(), 1u);
-  EXPECT_TRUE(id.IsValid());
-  EXPECT_TRUE(id.BIndividualAccount());
-  EXPECT_FALSE(k_steamIDNil.IsValid());
+TEST(Layout, SteamIdBitFields)
+{
+    CSteamID id(42u, k_EUniversePublic, k_EAccountTypeIndividual);
+    EXPECT_EQ(id.ConvertToUint64(), 76561197960265728ull + 42);
+    EXPECT_EQ(id.GetAccountID(), 42u);
+    EXPECT_EQ(id.GetUnAccountInstance(), 1u);
+    EXPECT_TRUE(id.IsValid());
+    EXPECT_TRUE(id.BIndividualAccount());
+    EXPECT_FALSE(k_steamIDNil.IsValid());
 }

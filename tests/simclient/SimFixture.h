@@ -8,32 +8,34 @@
 #include "simclient/World.h"
 
 class SimWorld : public ::testing::Test {
- protected:
-  void SetUp() override {
-    world.Reset();
-    ASSERT_TRUE(SteamAPI_Init());
-    world.ClearJournal();
-  }
-  void TearDown() override { world.Reset(); }
+protected:
+    void SetUp() override
+    {
+        world.Reset();
+        ASSERT_TRUE(SteamAPI_Init());
+        world.ClearJournal();
+    }
+    void TearDown() override { world.Reset(); }
 
-  simclient::World& world = simclient::GetWorld();
+    simclient::World& world = simclient::GetWorld();
 };
 
 // Records what a callback or call result handler received.
-template <class P>
-struct Catcher {
-  int calls = 0;
-  bool lastIoFailure = false;
-  P last{};
-  void OnCallback(P* p) {
-    ++calls;
-    last = *p;
-  }
-  void OnResult(P* p, bool ioFailure) {
-    ++calls;
-    lastIoFailure = ioFailure;
-    last = *p;
-  }
+template <class P> struct Catcher {
+    int calls = 0;
+    bool lastIoFailure = false;
+    P last{};
+    void OnCallback(P* p)
+    {
+        ++calls;
+        last = *p;
+    }
+    void OnResult(P* p, bool ioFailure)
+    {
+        ++calls;
+        lastIoFailure = ioFailure;
+        last = *p;
+    }
 };
 
 #endif  // TESTS_SIMCLIENT_SIM_FIXTURE_H

@@ -10,8 +10,7 @@ namespace {
 
 constexpr size_t kScoreEntrySize = 332;
 
-template <typename T>
-void WriteAt(void* base, size_t offset, T value)
+template <typename T> void WriteAt(void* base, size_t offset, T value)
 {
     std::memcpy(static_cast<unsigned char*>(base) + offset, &value, sizeof(T));
 }
@@ -23,7 +22,8 @@ char* AllocateText(HostServices* table, const char* text)
     return copy;
 }
 
-void WriteScoreRow(unsigned char* entry, const char* userId, const char* userName, int32_t score, int32_t rank)
+void WriteScoreRow(unsigned char* entry, const char* userId, const char* userName, int32_t score,
+                   int32_t rank)
 {
     std::memset(entry, 0, kScoreEntrySize);
     std::strcpy(reinterpret_cast<char*>(entry), userId);

@@ -43,7 +43,7 @@ TEST_F(FileStoreTest, ReadsSeeksAndTellsExactly)
 
     struct Step {
         const char* name;
-        int64_t seekTo;   // -1: no seek
+        int64_t seekTo;  // -1: no seek
         int32_t origin;
         int64_t readCount;
         const char* expected;
@@ -77,8 +77,9 @@ TEST_F(FileStoreTest, ReadsSeeksAndTellsExactly)
 TEST_F(FileStoreTest, OpensFilesUnderTheDataRoot)
 {
     // Catches engine paths resolved against the working folder instead of the root.
-    std::filesystem::path root = std::filesystem::temp_directory_path() /
-                                 ("simengine_files_" + std::to_string(::testing::UnitTest::GetInstance()->random_seed()));
+    std::filesystem::path root =
+        std::filesystem::temp_directory_path() /
+        ("simengine_files_" + std::to_string(::testing::UnitTest::GetInstance()->random_seed()));
     std::filesystem::create_directories(root / "leaderboards");
     std::ofstream(root / "leaderboards" / "board.xml", std::ios::binary) << "<root/>\n";
     engine.Paths().SetDataRoot(root.string());

@@ -7,7 +7,10 @@
 
 namespace {
 
-HostServices* Host() { return simengine::Engine::Instance().Table(); }
+HostServices* Host()
+{
+    return simengine::Engine::Instance().Table();
+}
 
 // Like a statistics updater: note the time, sleep 400, until quitting.
 std::atomic<int> passes{0};
@@ -118,7 +121,8 @@ TEST_F(ThreadsAndClockTest, HeldMutexBlocksOthersAndAllowsItsOwnerAgain)
     table->threads->LockMutex(mutex);
     table->threads->StartThread("Waiter", &LockAndRelease, mutex, 0);
     table->threads->UnlockMutex(mutex);
-    EXPECT_EQ(engine.Mutexes().Counts("STEAM_LEADERBOARDS_REQUEST").locks, 2) << "the waiter must still be blocked";
+    EXPECT_EQ(engine.Mutexes().Counts("STEAM_LEADERBOARDS_REQUEST").locks, 2)
+        << "the waiter must still be blocked";
     table->threads->UnlockMutex(mutex);
     engine.Threads().Join("Waiter");
     EXPECT_EQ(engine.Mutexes().Counts("STEAM_LEADERBOARDS_REQUEST").locks, 3);

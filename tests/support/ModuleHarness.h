@@ -47,8 +47,7 @@ protected:
 
     bool Start() { return module->Initialize(engine.Table()); }
 
-    template <class Service>
-    Service* ServiceAt(int32_t number)
+    template <class Service> Service* ServiceAt(int32_t number)
     {
         return dynamic_cast<Service*>(module->GetImplementation(number));
     }

@@ -40,7 +40,8 @@ std::string ReadBytes(const fs::path& path)
 
 void WriteBytes(const fs::path& path, const std::string& bytes)
 {
-    std::ofstream(path, std::ios::binary | std::ios::trunc).write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+    std::ofstream(path, std::ios::binary | std::ios::trunc)
+        .write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
 }
 
 std::vector<std::string> Lines(const std::string& text)
@@ -60,7 +61,8 @@ protected:
     void SetUp() override
     {
         static int serial = 0;
-        root_ = fs::temp_directory_path() / ("steamext_tools_" + std::to_string(getpid()) + "_" + std::to_string(++serial));
+        root_ = fs::temp_directory_path() /
+                ("steamext_tools_" + std::to_string(getpid()) + "_" + std::to_string(++serial));
         fs::remove_all(root_);
         fs::create_directories(root_ / "w");
     }
@@ -103,9 +105,9 @@ private:
 };
 
 const std::string kDecl = "<?xml version=\"1.0\"?>\n";
-const std::string kGoodXml = kDecl +
-                             "<root>\n <array id=\"A\" k=\"v\">\n  <node id=\"n1\" x=\"caf\xe9\">text</node>\n"
-                             "  <node y=\"2\"/>\n </array>\n</root>\n";
+const std::string kGoodXml =
+    kDecl + "<root>\n <array id=\"A\" k=\"v\">\n  <node id=\"n1\" x=\"caf\xe9\">text</node>\n"
+            "  <node y=\"2\"/>\n </array>\n</root>\n";
 // A name without '=': the parse error's character is 0, so printf's text stops there.
 const std::string kCaseOneXml = kDecl + "<root><a b>\n</root>\n";
 
@@ -116,7 +118,8 @@ TEST_F(DataTools, DumpPrintsTreeMessagesAndPopups)
     // past the given answers.
     const std::string caseOne =
         "Parsing error (Reading next block (case #1)) around line 2 in XML 'bad.xml'. Unexpected character '";
-    const std::string m2 = "DataManager: XML database needs to end with root block closing. 'bad.xml' is invalid.";
+    const std::string m2 =
+        "DataManager: XML database needs to end with root block closing. 'bad.xml' is invalid.";
     const std::string popup = "CANCEL_TRY_CONTINUE,Failed to load XML file 'bad.xml'.";
     struct Row {
         const char* name;
@@ -138,15 +141,33 @@ TEST_F(DataTools, DumpPrintsTreeMessagesAndPopups)
             "loaded": false, "arrays": [],
             "reports": [[1, "First non-whitespace char in XML document needs to be '<'. First char in 'd\u00e9.xml' is #233 '\u00e9'."]],
             "popups": ["CANCEL_TRY_CONTINUE,Failed to load XML file 'd\u00e9.xml'."], "logs": []})")},
-        {"unknown ending", "notes.txt", "x", {}, Json::parse(R"({"path": "notes.txt", "loaded": false, "arrays": [],
+        {"unknown ending",
+         "notes.txt",
+         "x",
+         {},
+         Json::parse(R"({"path": "notes.txt", "loaded": false, "arrays": [],
             "reports": [[1, "Unknown database file type 'notes.txt'. Supported formats are: .csv .xml"]],
             "popups": [], "logs": []})")},
-        {"answers run out, then null", "bad.xml", kCaseOneXml, {"TRY_AGAIN"},
-         {{"path", "bad.xml"}, {"loaded", false}, {"arrays", Json::array()},
-          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}}, {"popups", Json::array({popup, popup})}, {"logs", Json::array()}}},
-        {"answers used in order, other case gives up", "bad.xml", kCaseOneXml, {"TRY_AGAIN", "try_again", "TRY_AGAIN"},
-         {{"path", "bad.xml"}, {"loaded", false}, {"arrays", Json::array()},
-          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}}, {"popups", Json::array({popup, popup})}, {"logs", Json::array()}}},
+        {"answers run out, then null",
+         "bad.xml",
+         kCaseOneXml,
+         {"TRY_AGAIN"},
+         {{"path", "bad.xml"},
+          {"loaded", false},
+          {"arrays", Json::array()},
+          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}},
+          {"popups", Json::array({popup, popup})},
+          {"logs", Json::array()}}},
+        {"answers used in order, other case gives up",
+         "bad.xml",
+         kCaseOneXml,
+         {"TRY_AGAIN", "try_again", "TRY_AGAIN"},
+         {{"path", "bad.xml"},
+          {"loaded", false},
+          {"arrays", Json::array()},
+          {"reports", {{1, caseOne}, {1, m2}, {1, caseOne}, {1, m2}}},
+          {"popups", Json::array({popup, popup})},
+          {"logs", Json::array()}}},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.name);
@@ -198,10 +219,10 @@ TEST_F(DataTools, CheckPrintsMessagesThenVerdicts)
     const Outcome mixed = Run({"data", "check", "bad.xml", "good.xml"});
     EXPECT_EQ(mixed.status, 1);
     EXPECT_EQ(Lines(mixed.out),
-              (std::vector<std::string>{
-                  "ReportError(1): DataManager: XML database needs to end with root block closing. 'bad.xml' is invalid.",
-                  "ShowPopup: CANCEL_TRY_CONTINUE,Failed to load XML file 'bad.xml'.", "bad.xml: FAILED to load",
-                  "good.xml: ok (1 arrays, 2 nodes)"}));
+              (std::vector<std::string>{"ReportError(1): DataManager: XML database needs to end with root "
+                                        "block closing. 'bad.xml' is invalid.",
+                                        "ShowPopup: CANCEL_TRY_CONTINUE,Failed to load XML file 'bad.xml'.",
+                                        "bad.xml: FAILED to load", "good.xml: ok (1 arrays, 2 nodes)"}));
 }
 
 TEST_F(DataTools, ScrambleRoundTripLoadsAsThePlainFile)
@@ -292,4 +313,4 @@ TEST_F(DataTools, ErrorsAreOneLine)
     }
 }
 
-} // namespace
+}  // namespace

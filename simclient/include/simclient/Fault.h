@@ -12,40 +12,42 @@
 namespace simclient {
 
 struct Fault {
-  enum class Kind {
-    Fail,          // the call returns its failure value (false, 0, invalid handle, null)
-    ZeroHandle,    // an asynchronous call returns k_uAPICallInvalid; nothing is queued
-    IoFailure,     // the call result arrives with bIOFailure = true
-    Result,        // the result struct carries this EResult (or "not found"/"no success")
-    ExtraLatency,  // delivery waits this many more pumps
-    ShortRead,     // FileRead returns at most this many bytes
-    Drop,          // a handle is returned but its result never arrives
-  };
+    enum class Kind {
+        Fail,          // the call returns its failure value (false, 0, invalid handle, null)
+        ZeroHandle,    // an asynchronous call returns k_uAPICallInvalid; nothing is queued
+        IoFailure,     // the call result arrives with bIOFailure = true
+        Result,        // the result struct carries this EResult (or "not found"/"no success")
+        ExtraLatency,  // delivery waits this many more pumps
+        ShortRead,     // FileRead returns at most this many bytes
+        Drop,          // a handle is returned but its result never arrives
+    };
 
-  Kind kind = Kind::Fail;
-  int value = 0;
-  int skip = 0;   // matching calls to let through first
-  int times = 1;  // calls affected; 0 means every call from then on
+    Kind kind = Kind::Fail;
+    int value = 0;
+    int skip = 0;   // matching calls to let through first
+    int times = 1;  // calls affected; 0 means every call from then on
 
-  static Fault Fail() { return Fault{Kind::Fail}; }
-  static Fault ZeroHandle() { return Fault{Kind::ZeroHandle}; }
-  static Fault IoFailure() { return Fault{Kind::IoFailure}; }
-  static Fault Result(EResult r) { return Fault{Kind::Result, r}; }
-  static Fault ExtraLatency(int pumps) { return Fault{Kind::ExtraLatency, pumps}; }
-  static Fault ShortRead(int bytes) { return Fault{Kind::ShortRead, bytes}; }
-  static Fault Drop() { return Fault{Kind::Drop}; }
+    static Fault Fail() { return Fault{Kind::Fail}; }
+    static Fault ZeroHandle() { return Fault{Kind::ZeroHandle}; }
+    static Fault IoFailure() { return Fault{Kind::IoFailure}; }
+    static Fault Result(EResult r) { return Fault{Kind::Result, r}; }
+    static Fault ExtraLatency(int pumps) { return Fault{Kind::ExtraLatency, pumps}; }
+    static Fault ShortRead(int bytes) { return Fault{Kind::ShortRead, bytes}; }
+    static Fault Drop() { return Fault{Kind::Drop}; }
 
-  Fault Skip(int n) const {
-    Fault f = *this;
-    f.skip = n;
-    return f;
-  }
-  Fault Times(int n) const {
-    Fault f = *this;
-    f.times = n;
-    return f;
-  }
-  Fault Always() const { return Times(0); }
+    Fault Skip(int n) const
+    {
+        Fault f = *this;
+        f.skip = n;
+        return f;
+    }
+    Fault Times(int n) const
+    {
+        Fault f = *this;
+        f.times = n;
+        return f;
+    }
+    Fault Always() const { return Times(0); }
 };
 
 }  // namespace simclient

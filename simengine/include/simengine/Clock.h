@@ -41,8 +41,7 @@ public:
 
     // Blocks until a thread of this name is asleep (and not yet woken); false
     // when `timeout` of real time passes first. A guard against hangs only.
-    bool WaitUntilSleeping(const std::string& threadName,
-                           std::chrono::milliseconds timeout = kDefaultWait);
+    bool WaitUntilSleeping(const std::string& threadName, std::chrono::milliseconds timeout = kDefaultWait);
     int SleepingCount(const std::string& threadName) const;
     // ThreadSleep calls made by threads of this name since the last UseManual/UseScaled.
     uint64_t SleepCalls(const std::string& threadName) const;

@@ -16,7 +16,11 @@
 
 namespace simengine {
 
-enum class LogKind { Report, Log, Info };
+enum class LogKind {
+    Report,
+    Log,
+    Info
+};
 
 struct LogLine {
     LogKind kind;
@@ -75,7 +79,10 @@ struct CommandCall {
 };
 
 struct InputCall {
-    enum class Kind { Button, Axis };
+    enum class Kind {
+        Button,
+        Axis
+    };
     Kind kind;
     int32_t inputId;
     int32_t buttonValue;  // Button calls
@@ -101,8 +108,8 @@ struct EngineFault {
     std::string thread;
 };
 
-using JournalRecord = std::variant<PostedEvent, LogLine, CommandCall, InputCall, FileOpenCall,
-                                   ThreadStartCall, EngineFault>;
+using JournalRecord =
+    std::variant<PostedEvent, LogLine, CommandCall, InputCall, FileOpenCall, ThreadStartCall, EngineFault>;
 
 struct JournalEntry {
     uint64_t sequence;
@@ -133,8 +140,7 @@ public:
     std::vector<EngineFault> Faults() const;
 
 private:
-    template <typename T>
-    std::vector<T> All() const
+    template <typename T> std::vector<T> All() const
     {
         std::vector<T> found;
         for (const JournalEntry& entry : entries_)

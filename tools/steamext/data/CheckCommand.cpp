@@ -16,9 +16,12 @@ struct CheckOptions {
 const char* KindName(const simengine::LogLine& line)
 {
     switch (line.kind) {
-    case simengine::LogKind::Report: return "ReportError";
-    case simengine::LogKind::Log: return "Log";
-    case simengine::LogKind::Info: return "LogInfo";
+    case simengine::LogKind::Report:
+        return "ReportError";
+    case simengine::LogKind::Log:
+        return "Log";
+    case simengine::LogKind::Info:
+        return "LogInfo";
     }
     return "?";
 }
@@ -63,14 +66,15 @@ int RunCheck(const CheckOptions& options)
     return status;
 }
 
-} // namespace
+}  // namespace
 
 void AddCheckCommand(CLI::App& data, SubcommandAction& action)
 {
     auto options = std::make_shared<CheckOptions>();
-    CLI::App* check = data.add_subcommand("check", "Load each file as the module would and report what it says");
+    CLI::App* check =
+        data.add_subcommand("check", "Load each file as the module would and report what it says");
     check->add_option("files", options->files, "Data files (.xml, .dat, .csv)")->required();
     check->callback([options, &action] { action = [options] { return RunCheck(*options); }; });
 }
 
-} // namespace datatool
+}  // namespace datatool

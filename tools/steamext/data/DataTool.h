@@ -20,13 +20,14 @@ namespace datatool {
 struct LoadOutcome {
     std::unique_ptr<Database> database;
     bool loaded = false;
-    simengine::JournalView journal;   // everything the load said to the engine
+    simengine::JournalView journal;  // everything the load said to the engine
 };
 
 // Resets the simulated engine, answers the popups from `popupAnswers` in order
 // (null once they run out), and calls Database::Load with `path` unchanged. The
 // file is read relative to the current directory.
-LoadOutcome LoadThroughEngine(const std::string& path, const std::vector<std::optional<std::string>>& popupAnswers);
+LoadOutcome LoadThroughEngine(const std::string& path,
+                              const std::vector<std::optional<std::string>>& popupAnswers);
 
 // Bytes as code points of the same number (0x80-0xFF as U+0080-U+00FF), in UTF-8.
 std::string BytesAsText(const std::string& bytes);
@@ -49,4 +50,4 @@ void AddCheckCommand(CLI::App& data, SubcommandAction& action);
 void AddDumpCommand(CLI::App& data, SubcommandAction& action);
 void AddScrambleCommands(CLI::App& data, SubcommandAction& action);
 
-} // namespace datatool
+}  // namespace datatool

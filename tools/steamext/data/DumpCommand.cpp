@@ -34,7 +34,7 @@ int RunDump(const DumpOptions& options)
     return 0;
 }
 
-} // namespace
+}  // namespace
 
 Json DumpJson(const std::string& path, const LoadOutcome& outcome)
 {
@@ -65,9 +65,15 @@ Json DumpJson(const std::string& path, const LoadOutcome& outcome)
     for (const simengine::LogLine& line : outcome.journal.Logs()) {
         const std::string text = BytesAsText(CutAtZero(line.text));
         switch (line.kind) {
-        case simengine::LogKind::Report: reports.push_back(Json::array({line.level, text})); break;
-        case simengine::LogKind::Log: logs.push_back(Json::array({line.level, text})); break;
-        case simengine::LogKind::Info: logs.push_back(Json::array({"info", text})); break;
+        case simengine::LogKind::Report:
+            reports.push_back(Json::array({line.level, text}));
+            break;
+        case simengine::LogKind::Log:
+            logs.push_back(Json::array({line.level, text}));
+            break;
+        case simengine::LogKind::Info:
+            logs.push_back(Json::array({"info", text}));
+            break;
         }
     }
     Json popups = Json::array();
@@ -96,4 +102,4 @@ void AddDumpCommand(CLI::App& data, SubcommandAction& action)
     dump->callback([options, &action] { action = [options] { return RunDump(*options); }; });
 }
 
-} // namespace datatool
+}  // namespace datatool

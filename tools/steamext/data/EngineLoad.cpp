@@ -10,7 +10,8 @@
 
 namespace datatool {
 
-LoadOutcome LoadThroughEngine(const std::string& path, const std::vector<std::optional<std::string>>& popupAnswers)
+LoadOutcome LoadThroughEngine(const std::string& path,
+                              const std::vector<std::optional<std::string>>& popupAnswers)
 {
     simengine::Engine& engine = simengine::Engine::Instance();
     engine.Reset();
@@ -64,7 +65,8 @@ bool ReadFile(const std::string& path, std::string& bytes, std::string& error)
         in.setstate(std::ios::badbit);
     }
     if (in.bad()) {
-        error = "cannot read '" + path + "'" + (errno != 0 ? std::string(": ") + std::strerror(errno) : std::string());
+        error = "cannot read '" + path + "'" +
+                (errno != 0 ? std::string(": ") + std::strerror(errno) : std::string());
         bytes.clear();
         return false;
     }
@@ -83,4 +85,4 @@ bool WriteFile(const std::string& path, const std::string& bytes, std::string& e
     return true;
 }
 
-} // namespace datatool
+}  // namespace datatool

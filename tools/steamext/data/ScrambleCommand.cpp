@@ -37,7 +37,7 @@ int RunConvert(const char* name, const ConvertOptions& options, bool scramble)
     return 0;
 }
 
-} // namespace
+}  // namespace
 
 bool ScrambleText(const std::string& plain, std::string& envelopeBytes, std::string& error)
 {
@@ -68,8 +68,8 @@ bool UnscrambleText(const std::string& envelopeBytes, std::string& plain, std::s
     }
     const int32_t length = envelope::PayloadLength(bytes);
     if (size != int64_t{envelope::kHeaderSize} + length) {
-        error = "length mismatch: the header says " + std::to_string(length) + " bytes of payload, the file has " +
-                std::to_string(size - envelope::kHeaderSize);
+        error = "length mismatch: the header says " + std::to_string(length) +
+                " bytes of payload, the file has " + std::to_string(size - envelope::kHeaderSize);
         return false;
     }
     plain.assign(static_cast<size_t>(length), '\0');
@@ -78,7 +78,8 @@ bool UnscrambleText(const std::string& envelopeBytes, std::string& plain, std::s
     const uint32_t stored = envelope::PayloadChecksum(bytes);
     if (sum != stored) {
         char text[96];
-        std::snprintf(text, sizeof text, "checksum mismatch: the header says 0x%08" PRIx32 ", the payload gives 0x%08" PRIx32,
+        std::snprintf(text, sizeof text,
+                      "checksum mismatch: the header says 0x%08" PRIx32 ", the payload gives 0x%08" PRIx32,
                       stored, sum);
         error = text;
         plain.clear();
@@ -98,7 +99,8 @@ void AddScrambleCommands(CLI::App& data, SubcommandAction& action)
     });
 
     auto unscrambleOptions = std::make_shared<ConvertOptions>();
-    CLI::App* unscramble = data.add_subcommand("unscramble", "Take a data file out of its scrambled envelope");
+    CLI::App* unscramble =
+        data.add_subcommand("unscramble", "Take a data file out of its scrambled envelope");
     unscramble->add_option("input", unscrambleOptions->input, "Envelope")->required();
     unscramble->add_option("output", unscrambleOptions->output, "Plain data file to write")->required();
     unscramble->callback([unscrambleOptions, &action] {
@@ -106,4 +108,4 @@ void AddScrambleCommands(CLI::App& data, SubcommandAction& action)
     });
 }
 
-} // namespace datatool
+}  // namespace datatool

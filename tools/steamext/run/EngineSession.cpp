@@ -59,7 +59,8 @@ void StartNamedThread(const char* name, HostThreadEntry entry, void* argument, i
         engineThreads->StartThread(name, entry, argument, flags);
         return;
     }
-    engineThreads->StartThread(name, &NamedEntry, new Launch{entry, argument, name != nullptr ? name : ""}, flags);
+    engineThreads->StartThread(name, &NamedEntry, new Launch{entry, argument, name != nullptr ? name : ""},
+                               flags);
 }
 
 // ---- The engine's journal as records.
@@ -85,7 +86,10 @@ json ToRecord(const simengine::PostedEvent& event)
         record["count"] = s.count;
         json rows = json::array();
         for (const auto& row : s.rows)
-            rows.push_back({{"userId", row.userId}, {"userName", row.userName}, {"score", row.score}, {"rank", row.rank},
+            rows.push_back({{"userId", row.userId},
+                            {"userName", row.userName},
+                            {"score", row.score},
+                            {"rank", row.rank},
                             {"detailsSize", row.detailsSize}});
         record["entries"] = event.scores->entriesNull ? json(nullptr) : rows;
     }
@@ -112,7 +116,9 @@ json ToRecord(const simengine::LogLine& line)
 
 json ToRecord(const simengine::CommandCall& call)
 {
-    return {{"kind", "host_command"}, {"command", call.command}, {"argument", Text(call.argument)},
+    return {{"kind", "host_command"},
+            {"command", call.command},
+            {"argument", Text(call.argument)},
             {"answer", Text(call.answer)}};
 }
 

@@ -36,9 +36,8 @@ std::string Seen(const std::vector<json>& records)
 
 std::string ShowBytes(const std::string& bytes)
 {
-    bool printable = std::all_of(bytes.begin(), bytes.end(), [](char c) {
-        return (c >= 0x20 && c < 0x7F) || c == '\n' || c == '\t';
-    });
+    bool printable = std::all_of(bytes.begin(), bytes.end(),
+                                 [](char c) { return (c >= 0x20 && c < 0x7F) || c == '\n' || c == '\t'; });
     return printable ? Compact(json(bytes)) : "base64 " + EncodeBase64(bytes);
 }
 
@@ -48,13 +47,15 @@ void InOrder(const std::vector<json>& patterns, const std::vector<json>& seen, c
     std::vector<json> ordered;
     for (const auto& pattern : patterns) {
         if (pattern.contains("count")) {
-            auto count = std::count_if(seen.begin(), seen.end(), [&](const json& r) { return MatchesPattern(r, pattern); });
+            auto count = std::count_if(seen.begin(), seen.end(),
+                                       [&](const json& r) { return MatchesPattern(r, pattern); });
             int wanted = pattern["count"].get<int>();
             json shown = pattern;
             shown.erase("count");
             std::string text = what + " " + Compact(shown) + " " + std::to_string(wanted) + " time(s)";
-            out.push_back({count == wanted, count == wanted ? text : text + ", saw it " + std::to_string(count) +
-                                                                        " time(s): " + Seen(seen)});
+            out.push_back({count == wanted, count == wanted ? text
+                                                            : text + ", saw it " + std::to_string(count) +
+                                                                  " time(s): " + Seen(seen)});
         } else {
             ordered.push_back(pattern);
         }
@@ -84,7 +85,8 @@ void NoneOf(const std::vector<json>& patterns, const std::vector<json>& seen, co
             std::vector<CheckOutcome>& out)
 {
     for (const auto& pattern : patterns) {
-        auto hit = std::find_if(seen.begin(), seen.end(), [&](const json& r) { return MatchesPattern(r, pattern); });
+        auto hit =
+            std::find_if(seen.begin(), seen.end(), [&](const json& r) { return MatchesPattern(r, pattern); });
         std::string text = "no " + what + " " + Compact(pattern);
         out.push_back({hit == seen.end(), hit == seen.end() ? text : text + ", saw " + DescribeRecord(*hit)});
     }
@@ -101,11 +103,14 @@ std::string WithoutSpaces(std::string text)
 std::string ShowResult(const CallResult& result, ResultType type)
 {
     switch (type) {
-    case ResultType::None: return "";
+    case ResultType::None:
+        return "";
     case ResultType::Buffer:
-        return result.bytes ? "buffer of " + std::to_string(result.bytes->size()) + " bytes " + ShowBytes(*result.bytes)
+        return result.bytes ? "buffer of " + std::to_string(result.bytes->size()) + " bytes " +
+                                  ShowBytes(*result.bytes)
                             : "null";
-    default: return Compact(result.value);
+    default:
+        return Compact(result.value);
     }
 }
 
@@ -157,7 +162,8 @@ std::vector<CheckOutcome> Evaluate(const Expectations& expect, const std::option
         std::vector<int> axes;
         for (const auto& input : OfKind(records, "input"))
             (input.value("call", "") == "SetInputButton" ? buttons : axes).push_back(input.value("id", 0));
-        auto check = [&out](const std::optional<std::string>& wanted, const std::vector<int>& ids, const char* what) {
+        auto check = [&out](const std::optional<std::string>& wanted, const std::vector<int>& ids,
+                            const char* what) {
             if (!wanted)
                 return;
             std::string seen = IdRanges(ids);

@@ -182,7 +182,8 @@ std::string ReadablePath(const std::string& pointer)
     std::size_t at = 0;
     while (at < pointer.size()) {
         std::size_t next = pointer.find('/', at + 1);
-        std::string token = pointer.substr(at + 1, next == std::string::npos ? std::string::npos : next - at - 1);
+        std::string token =
+            pointer.substr(at + 1, next == std::string::npos ? std::string::npos : next - at - 1);
         bool index = !token.empty() && token.find_first_not_of("0123456789") == std::string::npos;
         if (index)
             result += "[" + token + "]";

@@ -11,8 +11,8 @@ BaseImplementation* CallTarget::Service(int32_t number, const char* serviceName)
 {
     BaseImplementation* service = module->GetImplementation(number);
     if (service == nullptr)
-        throw CallFailure("the module offers no " + std::string(serviceName) + " service: GetImplementation(" +
-                          std::to_string(number) + ") gave null");
+        throw CallFailure("the module offers no " + std::string(serviceName) +
+                          " service: GetImplementation(" + std::to_string(number) + ") gave null");
     return service;
 }
 
@@ -68,23 +68,43 @@ void AddBaseOperations(OperationTable& table, const std::string& service, int32_
 {
     std::string prefix = service + ".";
     // The service name lives as long as the table: the invokers keep a copy.
-    auto get = [service, number](const CallTarget& target) { return target.Service(number, service.c_str()); };
-    table.Add({prefix + "GetServiceType", {}, ResultType::Int,
-               [get](const CallTarget& t, const std::vector<ArgValue>&) { return IntResult(get(t)->GetServiceType()); }});
-    table.Add({prefix + "GetPlatformName", {}, ResultType::Text,
-               [get](const CallTarget& t, const std::vector<ArgValue>&) { return TextResult(get(t)->GetPlatformName()); }});
-    table.Add({prefix + "Initialize", {}, ResultType::Bool,
-               [get](const CallTarget& t, const std::vector<ArgValue>&) { return BoolResult(get(t)->Initialize()); }});
-    table.Add({prefix + "Shutdown", {}, ResultType::None, [get](const CallTarget& t, const std::vector<ArgValue>&) {
-                   get(t)->Shutdown();
-                   return NoResult();
+    auto get = [service, number](const CallTarget& target) {
+        return target.Service(number, service.c_str());
+    };
+    table.Add({prefix + "GetServiceType",
+               {},
+               ResultType::Int,
+               [get](const CallTarget& t, const std::vector<ArgValue>&) {
+                   return IntResult(get(t)->GetServiceType());
                }});
-    table.Add({prefix + "Update", {}, ResultType::None, [get](const CallTarget& t, const std::vector<ArgValue>&) {
-                   get(t)->Update();
-                   return NoResult();
+    table.Add({prefix + "GetPlatformName",
+               {},
+               ResultType::Text,
+               [get](const CallTarget& t, const std::vector<ArgValue>&) {
+                   return TextResult(get(t)->GetPlatformName());
                }});
-    table.Add({prefix + "IsAvailable", {}, ResultType::Bool,
-               [get](const CallTarget& t, const std::vector<ArgValue>&) { return BoolResult(get(t)->IsAvailable()); }});
+    table.Add({prefix + "Initialize",
+               {},
+               ResultType::Bool,
+               [get](const CallTarget& t, const std::vector<ArgValue>&) {
+                   return BoolResult(get(t)->Initialize());
+               }});
+    table.Add(
+        {prefix + "Shutdown", {}, ResultType::None, [get](const CallTarget& t, const std::vector<ArgValue>&) {
+             get(t)->Shutdown();
+             return NoResult();
+         }});
+    table.Add(
+        {prefix + "Update", {}, ResultType::None, [get](const CallTarget& t, const std::vector<ArgValue>&) {
+             get(t)->Update();
+             return NoResult();
+         }});
+    table.Add({prefix + "IsAvailable",
+               {},
+               ResultType::Bool,
+               [get](const CallTarget& t, const std::vector<ArgValue>&) {
+                   return BoolResult(get(t)->IsAvailable());
+               }});
 }
 
 CallResult NoResult()
@@ -105,7 +125,8 @@ CallResult IntResult(int32_t value)
 CallResult TextResult(const char* text)
 {
     // Copied at once: a result may live in a buffer that the next call rewrites.
-    return CallResult{text == nullptr ? nlohmann::json(nullptr) : nlohmann::json(std::string(text)), std::nullopt};
+    return CallResult{text == nullptr ? nlohmann::json(nullptr) : nlohmann::json(std::string(text)),
+                      std::nullopt};
 }
 
 const OperationTable& Operations()

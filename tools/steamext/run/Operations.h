@@ -47,7 +47,7 @@ struct ArgValue {
 };
 
 enum class ResultType {
-    None,     // returns nothing
+    None,  // returns nothing
     Bool,
     Int,
     Text,     // a text or null

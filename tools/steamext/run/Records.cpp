@@ -11,11 +11,13 @@ bool MatchesPattern(const json& record, const json& pattern)
         const std::string& key = item.key();
         if (key == "count")
             continue;
-        if (key.size() > kContains.size() && key.compare(key.size() - kContains.size(), kContains.size(), kContains) == 0) {
+        if (key.size() > kContains.size() &&
+            key.compare(key.size() - kContains.size(), kContains.size(), kContains) == 0) {
             std::string field = key.substr(0, key.size() - kContains.size());
             auto found = record.find(field);
             if (found == record.end() || !found->is_string() ||
-                found->get_ref<const std::string&>().find(item.value().get<std::string>()) == std::string::npos)
+                found->get_ref<const std::string&>().find(item.value().get<std::string>()) ==
+                    std::string::npos)
                 return false;
             continue;
         }
@@ -63,11 +65,12 @@ std::string DescribeRecord(const json& record)
         int level = record.value("level", 0);
         std::string name = level >= 0 && level <= 2 ? kLevels[level] : "level " + std::to_string(level);
         std::string source = record.value("source", "Log");
-        return "log " + name + (source == "ReportError" ? " (ReportError)" : "") + "  " + record.value("text", "");
+        return "log " + name + (source == "ReportError" ? " (ReportError)" : "") + "  " +
+               record.value("text", "");
     }
     if (kind == "host_command") {
-        return "engine command " + record.value("command", "") + "(" + Compact(record["argument"]) +
-               ") -> " + Compact(record["answer"]);
+        return "engine command " + record.value("command", "") + "(" + Compact(record["argument"]) + ") -> " +
+               Compact(record["answer"]);
     }
     if (kind == "platform_call") {
         std::string thread = record.value("thread", "main");

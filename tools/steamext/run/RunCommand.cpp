@@ -73,8 +73,9 @@ int Run(const RunArguments& arguments)
                     " does not exist; build the target steam_extension, or give --module PATH");
 
     bool colour = !arguments.json && isatty(STDOUT_FILENO) && std::getenv("NO_COLOR") == nullptr;
-    std::unique_ptr<Timeline> timeline =
-        arguments.json ? MakeJsonTimeline(std::cout) : MakeReadableTimeline(std::cout, colour, arguments.verbose);
+    std::unique_ptr<Timeline> timeline = arguments.json
+                                             ? MakeJsonTimeline(std::cout)
+                                             : MakeReadableTimeline(std::cout, colour, arguments.verbose);
     try {
         return PlayScenario(scenario, options, *timeline);
     } catch (const ModuleLoadError& error) {

@@ -84,7 +84,9 @@ private:
         case StepKind::Note:
             timeline_.Step(Now(), step.index, "check", step.note, {{"action", "check"}});
             break;
-        case StepKind::Call: result = Call(step); break;
+        case StepKind::Call:
+            result = Call(step);
+            break;
         case StepKind::Frames:
             timeline_.Step(Now(), step.index, "pump " + std::to_string(step.frames) + " frame(s)", step.note,
                            {{"action", "frames"}, {"frames", step.frames}});
@@ -92,16 +94,20 @@ private:
                 Frame();
             break;
         case StepKind::Advance:
-            timeline_.Step(Now(), step.index, "advance the clock by " + std::to_string(step.advanceMs) + " ms",
-                           step.note, {{"action", "advance"}, {"ms", step.advanceMs}});
+            timeline_.Step(Now(), step.index,
+                           "advance the clock by " + std::to_string(step.advanceMs) + " ms", step.note,
+                           {{"action", "advance"}, {"ms", step.advanceMs}});
             engine_->Advance(step.advanceMs);
             break;
-        case StepKind::Wait: Wait(step); break;
+        case StepKind::Wait:
+            Wait(step);
+            break;
         case StepKind::World: {
             std::string what;
             for (const auto& edit : step.world)
                 what += (what.empty() ? "" : "; ") + edit.description;
-            timeline_.Step(Now(), step.index, "world: " + what, step.note, {{"action", "world"}, {"changes", what}});
+            timeline_.Step(Now(), step.index, "world: " + what, step.note,
+                           {{"action", "world"}, {"changes", what}});
             for (const auto& edit : step.world)
                 edit.apply(world_);
             break;
@@ -135,15 +141,17 @@ private:
         try {
             result = step.operation->invoke(target_, step.args);
         } catch (const CallFailure& failure) {
-            timeline_.Step(at, step.index, call, step.note, {{"action", "call"}, {"operation", step.operation->name}});
-            Fail(step.index, "step #" + std::to_string(step.index) + " (" + step.place + "): could not call " +
-                                 step.operation->name + ": " + failure.what());
+            timeline_.Step(at, step.index, call, step.note,
+                           {{"action", "call"}, {"operation", step.operation->name}});
+            Fail(step.index, "step #" + std::to_string(step.index) + " (" + step.place +
+                                 "): could not call " + step.operation->name + ": " + failure.what());
             return std::nullopt;
         }
         std::string shown = ShowResult(result, step.operation->result);
         json detail = {{"action", "call"}, {"operation", step.operation->name}, {"args", step.argsShown}};
         if (step.operation->result != ResultType::None)
-            detail["result"] = result.bytes ? json{{"size", result.bytes->size()}, {"bytes_base64", EncodeBase64(*result.bytes)}}
+            detail["result"] = result.bytes ? json{{"size", result.bytes->size()},
+                                                   {"bytes_base64", EncodeBase64(*result.bytes)}}
                                             : result.value;
         timeline_.Step(at, step.index, shown.empty() ? call : call + " -> " + shown, step.note, detail);
         return result;
@@ -161,9 +169,13 @@ private:
     void Wait(const Step& step)
     {
         timeline_.Step(Now(), step.index,
-                       "wait for " + step.wait.description + ", up to " + std::to_string(step.timeoutMs) + " ms",
-                       step.note, {{"action", "wait"}, {"for", step.wait.kind}, {"pattern", step.wait.pattern},
-                                   {"timeout_ms", step.timeoutMs}});
+                       "wait for " + step.wait.description + ", up to " + std::to_string(step.timeoutMs) +
+                           " ms",
+                       step.note,
+                       {{"action", "wait"},
+                        {"for", step.wait.kind},
+                        {"pattern", step.wait.pattern},
+                        {"timeout_ms", step.timeoutMs}});
         const Moment start = Now();
         const auto realStart = std::chrono::steady_clock::now();
         std::size_t looked = 0;
@@ -173,17 +185,20 @@ private:
                 const json& record = stepRecords_[looked];
                 if (record.value("kind", "") == step.wait.kind && MatchesPattern(record, step.wait.pattern)) {
                     Moment now = Now();
-                    timeline_.Outcome(now, "arrived after " + std::to_string(now.frame - start.frame) + " frame(s), " +
-                                               std::to_string(now.clockMs - start.clockMs) + " ms");
+                    timeline_.Outcome(now, "arrived after " + std::to_string(now.frame - start.frame) +
+                                               " frame(s), " + std::to_string(now.clockMs - start.clockMs) +
+                                               " ms");
                     return;
                 }
             }
             uint32_t waited = Now().clockMs - start.clockMs;
-            double realWaited = std::chrono::duration<double>(std::chrono::steady_clock::now() - realStart).count();
+            double realWaited =
+                std::chrono::duration<double>(std::chrono::steady_clock::now() - realStart).count();
             if (waited >= step.timeoutMs || realWaited >= options_.realTimeGuardSeconds) {
                 Fail(step.index, "step #" + std::to_string(step.index) + " (" + step.place + "): waited " +
-                                     std::to_string(waited) + " ms (" + std::to_string(Now().frame - start.frame) +
-                                     " frames) for " + step.wait.description + ", it did not come");
+                                     std::to_string(waited) + " ms (" +
+                                     std::to_string(Now().frame - start.frame) + " frames) for " +
+                                     step.wait.description + ", it did not come");
                 return;
             }
             Frame();

@@ -38,13 +38,13 @@ struct WorldEdit {
 struct EngineSetup {
     std::map<std::string, std::string> productValues;
     std::set<std::string> features;
-    std::optional<std::filesystem::path> dataRoot;      // absolute, resolved against the scenario's folder
-    std::map<std::string, std::string> dataFiles;       // written under a fresh data root
+    std::optional<std::filesystem::path> dataRoot;         // absolute, resolved against the scenario's folder
+    std::map<std::string, std::string> dataFiles;          // written under a fresh data root
     std::vector<std::optional<std::string>> popupAnswers;  // nullopt: the popup gives null
     std::map<std::string, std::optional<std::string>> commandAnswers;
     bool manualClock = true;  // false: a real clock scaled by timeScale
     double timeScale = 1.0;
-    uint32_t frameMs = 16;    // how far one frame moves the clock
+    uint32_t frameMs = 16;  // how far one frame moves the clock
 };
 
 // What a step waits for: a record of one kind matching a pattern.
@@ -60,14 +60,21 @@ struct Expectations {
     std::optional<std::vector<nlohmann::json>> events;  // exactly these, in order
     std::vector<nlohmann::json> logs;                   // in order, others allowed between
     std::vector<nlohmann::json> noLogs;
-    std::vector<nlohmann::json> platformCalls;          // in order, others allowed between
+    std::vector<nlohmann::json> platformCalls;  // in order, others allowed between
     std::vector<nlohmann::json> noPlatformCalls;
-    std::vector<nlohmann::json> hostCommands;           // in order
-    std::optional<std::string> inputButtons;            // id ranges, "0-254,801-863"; "" for none
+    std::vector<nlohmann::json> hostCommands;  // in order
+    std::optional<std::string> inputButtons;   // id ranges, "0-254,801-863"; "" for none
     std::optional<std::string> inputAxes;
 };
 
-enum class StepKind { Note, Call, Frames, Advance, Wait, World };
+enum class StepKind {
+    Note,
+    Call,
+    Frames,
+    Advance,
+    Wait,
+    World
+};
 
 struct Step {
     std::size_t index = 0;  // 1-based, as the timeline shows it
@@ -79,9 +86,9 @@ struct Step {
     std::vector<ArgValue> args;
     nlohmann::json argsShown;  // the arguments as written, for the timeline
 
-    uint32_t frames = 0;    // Frames
+    uint32_t frames = 0;     // Frames
     uint32_t advanceMs = 0;  // Advance
-    WaitCondition wait;     // Wait
+    WaitCondition wait;      // Wait
     uint32_t timeoutMs = 0;
     std::vector<WorldEdit> world;  // World
 
@@ -97,7 +104,8 @@ struct Scenario {
 };
 
 // Reads and checks a whole scenario. `baseDir` resolves a relative data root.
-Scenario ParseScenario(const std::string& text, const std::string& displayName, const std::filesystem::path& baseDir);
+Scenario ParseScenario(const std::string& text, const std::string& displayName,
+                       const std::filesystem::path& baseDir);
 
 // The built-in tour, the text of scenarios/tour.json at build time.
 extern const char* const kBuiltinTour;

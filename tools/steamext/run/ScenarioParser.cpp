@@ -17,8 +17,8 @@ EngineSetup ParseEngine(const R& r, const json& engine, const std::string& at)
 {
     r.Object(engine, at);
     r.OnlyKeys(engine, at,
-               {"product_values", "features", "data_root", "data_files", "popup_answers", "command_answers", "clock",
-                "time_scale", "frame_ms"});
+               {"product_values", "features", "data_root", "data_files", "popup_answers", "command_answers",
+                "clock", "time_scale", "frame_ms"});
     EngineSetup setup;
     if (engine.contains("product_values")) {
         const std::string p = R::Child(at, "product_values");
@@ -32,7 +32,8 @@ EngineSetup ParseEngine(const R& r, const json& engine, const std::string& at)
             setup.features.insert(r.String(list[i], R::Child(p, i)));
     }
     if (engine.contains("data_root") && engine.contains("data_files"))
-        r.Fail(R::Child(at, "data_files"), "give either \"data_root\" (a folder) or \"data_files\" (inline), not both");
+        r.Fail(R::Child(at, "data_files"),
+               "give either \"data_root\" (a folder) or \"data_files\" (inline), not both");
     if (engine.contains("data_root")) {
         const std::string p = R::Child(at, "data_root");
         std::string root = r.String(engine["data_root"], p);
@@ -45,7 +46,8 @@ EngineSetup ParseEngine(const R& r, const json& engine, const std::string& at)
         for (const auto& item : r.Object(engine["data_files"], p).items()) {
             const std::string& path = item.key();
             if (path.empty() || path[0] == '/' || path.find("..") != std::string::npos)
-                r.Fail(R::Child(p, path), "a data file's path must be relative and stay inside the data root");
+                r.Fail(R::Child(p, path),
+                       "a data file's path must be relative and stay inside the data root");
             setup.dataFiles[path] = r.Bytes(item.value(), R::Child(p, path));
         }
     }
@@ -64,7 +66,8 @@ EngineSetup ParseEngine(const R& r, const json& engine, const std::string& at)
         const std::string p = R::Child(at, "clock");
         std::string clock = r.String(engine["clock"], p);
         if (clock != "manual" && clock != "scaled")
-            r.Fail(p, "the clock is \"manual\" (moved by frames and steps) or \"scaled\" (real time, sped up)");
+            r.Fail(p,
+                   "the clock is \"manual\" (moved by frames and steps) or \"scaled\" (real time, sped up)");
         setup.manualClock = clock == "manual";
     }
     if (engine.contains("time_scale")) {
@@ -90,7 +93,8 @@ std::vector<ArgValue> ParseArgs(const R& r, const Operation& op, const json* giv
     std::vector<std::string> places(op.args.size(), at);
     if (given != nullptr && given->is_array()) {
         if (given->size() > op.args.size())
-            r.Fail(R::Child(at, op.args.size()), "\"" + op.name + "\" takes " + std::to_string(op.args.size()) +
+            r.Fail(R::Child(at, op.args.size()), "\"" + op.name + "\" takes " +
+                                                     std::to_string(op.args.size()) +
                                                      " argument(s), this is one too many");
         for (std::size_t i = 0; i < given->size(); ++i) {
             values[i] = &(*given)[i];
@@ -112,27 +116,37 @@ std::vector<ArgValue> ParseArgs(const R& r, const Operation& op, const json* giv
             places[i] = R::Child(at, item.key());
         }
     } else if (given != nullptr) {
-        r.Fail(at, "arguments are a list [...] by position or an object {...} by name, not " + R::Describe(*given));
+        r.Fail(at, "arguments are a list [...] by position or an object {...} by name, not " +
+                       R::Describe(*given));
     }
 
     std::vector<ArgValue> args(op.args.size());
     for (std::size_t i = 0; i < op.args.size(); ++i) {
         const ArgSpec& spec = op.args[i];
-        const json* value = values[i] != nullptr ? values[i] : spec.defaultValue ? &*spec.defaultValue : nullptr;
+        const json* value = values[i] != nullptr ? values[i]
+                            : spec.defaultValue  ? &*spec.defaultValue
+                                                 : nullptr;
         if (value == nullptr && spec.sizeOfArg < 0)
-            r.Fail(at, "\"" + op.name + "\" needs the argument \"" + spec.name + "\" (number " + std::to_string(i + 1) +
-                           ")");
+            r.Fail(at, "\"" + op.name + "\" needs the argument \"" + spec.name + "\" (number " +
+                           std::to_string(i + 1) + ")");
         const std::string& p = places[i];
         switch (spec.type) {
         case ArgType::Int:
             if (value == nullptr)
-                args[i].number = static_cast<int32_t>(args[static_cast<std::size_t>(spec.sizeOfArg)].bytes.size());
+                args[i].number =
+                    static_cast<int32_t>(args[static_cast<std::size_t>(spec.sizeOfArg)].bytes.size());
             else
                 args[i].number = r.Int(*value, p);
             break;
-        case ArgType::Bool: args[i].flag = r.Bool(*value, p); break;
-        case ArgType::Text: args[i].text = r.StringOrNull(*value, p); break;
-        case ArgType::Bytes: args[i].bytes = r.Bytes(*value, p); break;
+        case ArgType::Bool:
+            args[i].flag = r.Bool(*value, p);
+            break;
+        case ArgType::Text:
+            args[i].text = r.StringOrNull(*value, p);
+            break;
+        case ArgType::Bytes:
+            args[i].bytes = r.Bytes(*value, p);
+            break;
         }
     }
     return args;
@@ -141,10 +155,14 @@ std::vector<ArgValue> ParseArgs(const R& r, const Operation& op, const json* giv
 json ParseExpectedResult(const R& r, const Operation& op, const json& value, const std::string& at)
 {
     switch (op.result) {
-    case ResultType::None: r.Fail(at, "\"" + op.name + "\" returns nothing, so there is no result to expect");
-    case ResultType::Bool: return r.Bool(value, at);
-    case ResultType::Int: return r.Int(value, at);
-    case ResultType::Text: return value.is_null() ? json(nullptr) : json(r.String(value, at));
+    case ResultType::None:
+        r.Fail(at, "\"" + op.name + "\" returns nothing, so there is no result to expect");
+    case ResultType::Bool:
+        return r.Bool(value, at);
+    case ResultType::Int:
+        return r.Int(value, at);
+    case ResultType::Text:
+        return value.is_null() ? json(nullptr) : json(r.String(value, at));
     case ResultType::Buffer:
         // Null, or the buffer's content as text or {"base64": "..."}.
         return value.is_null() ? json(nullptr) : json{{"bytes", r.Bytes(value, at)}};
@@ -195,11 +213,13 @@ const std::vector<std::string> kLogKeys = {"level", "text", "text_contains", "so
 const std::vector<std::string> kCallKeys = {"name", "args", "args_contains", "thread"};
 const std::vector<std::string> kHostKeys = {"command", "argument", "argument_contains", "answer"};
 
-void ParseExpectations(const R& r, const json& step, const std::string& at, const Operation* op, Expectations& e)
+void ParseExpectations(const R& r, const json& step, const std::string& at, const Operation* op,
+                       Expectations& e)
 {
     if (step.contains("expect")) {
         if (op == nullptr)
-            r.Fail(R::Child(at, "expect"), "\"expect\" checks a call's result and needs \"call\" in the same step");
+            r.Fail(R::Child(at, "expect"),
+                   "\"expect\" checks a call's result and needs \"call\" in the same step");
         e.result = ParseExpectedResult(r, *op, step["expect"], R::Child(at, "expect"));
     }
     if (step.contains("events")) {
@@ -227,11 +247,11 @@ void ParseExpectations(const R& r, const json& step, const std::string& at, cons
         e.platformCalls =
             ParsePatterns(r, step["platform_calls"], R::Child(at, "platform_calls"), "name", kCallKeys, true);
     if (step.contains("no_platform_calls"))
-        e.noPlatformCalls = ParsePatterns(r, step["no_platform_calls"], R::Child(at, "no_platform_calls"), "name",
-                                          kCallKeys, false);
+        e.noPlatformCalls = ParsePatterns(r, step["no_platform_calls"], R::Child(at, "no_platform_calls"),
+                                          "name", kCallKeys, false);
     if (step.contains("host_commands"))
-        e.hostCommands =
-            ParsePatterns(r, step["host_commands"], R::Child(at, "host_commands"), "command", kHostKeys, true);
+        e.hostCommands = ParsePatterns(r, step["host_commands"], R::Child(at, "host_commands"), "command",
+                                       kHostKeys, true);
     if (step.contains("inputs")) {
         const std::string p = R::Child(at, "inputs");
         const json& inputs = step["inputs"];
@@ -277,8 +297,9 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
 {
     const json& step = r.Object(value, at);
     r.OnlyKeys(step, at,
-               {"note", "call", "args", "frames", "advance_ms", "wait_for", "timeout_ms", "world", "expect", "events",
-                "logs", "no_logs", "platform_calls", "no_platform_calls", "host_commands", "inputs"});
+               {"note", "call", "args", "frames", "advance_ms", "wait_for", "timeout_ms", "world", "expect",
+                "events", "logs", "no_logs", "platform_calls", "no_platform_calls", "host_commands",
+                "inputs"});
     Step s;
     s.index = index;
     s.place = r.Place(at);
@@ -289,7 +310,8 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
     for (const char* key : {"call", "frames", "advance_ms", "wait_for", "world"})
         actions += step.contains(key) ? 1 : 0;
     if (actions > 1)
-        r.Fail(at, "a step does one thing: one of \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\"");
+        r.Fail(at,
+               "a step does one thing: one of \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\"");
     if (step.contains("args") && !step.contains("call"))
         r.Fail(R::Child(at, "args"), "\"args\" belongs to a \"call\"");
     if (step.contains("timeout_ms") && !step.contains("wait_for"))
@@ -306,7 +328,8 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
             for (const auto& candidate : similar)
                 hint += (hint.empty() ? "; did you mean " : " or ") + ("\"" + candidate + "\"");
             if (hint.empty())
-                hint = "; see docs/scenarios.md for the operations (service ones are \"<service>.<Operation>\")";
+                hint =
+                    "; see docs/scenarios.md for the operations (service ones are \"<service>.<Operation>\")";
             r.Fail(p, "unknown operation \"" + name + "\"" + hint);
         }
         const json* args = step.contains("args") ? &step["args"] : nullptr;
@@ -330,13 +353,15 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
     }
     ParseExpectations(r, step, at, s.operation, s.expect);
     if (s.kind == StepKind::Note && s.note.empty() && step.size() == 0)
-        r.Fail(at, "an empty step; give it \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\" or \"note\"");
+        r.Fail(at, "an empty step; give it \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\" or "
+                   "\"note\"");
     return s;
 }
 
 }  // namespace
 
-Scenario ParseScenario(const std::string& text, const std::string& displayName, const std::filesystem::path& baseDir)
+Scenario ParseScenario(const std::string& text, const std::string& displayName,
+                       const std::filesystem::path& baseDir)
 {
     json document;
     try {
@@ -365,7 +390,8 @@ Scenario ParseScenario(const std::string& text, const std::string& displayName, 
     if (scenario.engine.dataRoot && scenario.engine.dataRoot->is_relative())
         scenario.engine.dataRoot = baseDir / *scenario.engine.dataRoot;
     if (scenario.engine.dataRoot && !std::filesystem::is_directory(*scenario.engine.dataRoot))
-        r.Fail("/engine/data_root", "the data root " + scenario.engine.dataRoot->string() + " is not a folder");
+        r.Fail("/engine/data_root",
+               "the data root " + scenario.engine.dataRoot->string() + " is not a folder");
     if (!document.contains("steps"))
         r.Fail("", "a scenario needs \"steps\", the list of what to do");
     const json& steps = r.Array(document["steps"], "/steps");

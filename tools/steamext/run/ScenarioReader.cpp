@@ -37,15 +37,23 @@ std::string ScenarioReader::Describe(const json& value)
     if (shown.size() > 40)
         shown = shown.substr(0, 37) + "...";
     switch (value.type()) {
-    case json::value_t::null: return "null";
-    case json::value_t::boolean: return "a boolean (" + shown + ")";
+    case json::value_t::null:
+        return "null";
+    case json::value_t::boolean:
+        return "a boolean (" + shown + ")";
     case json::value_t::number_integer:
-    case json::value_t::number_unsigned: return "an integer (" + shown + ")";
-    case json::value_t::number_float: return "a number with a fraction (" + shown + ")";
-    case json::value_t::string: return "a string (" + shown + ")";
-    case json::value_t::array: return "a list";
-    case json::value_t::object: return "an object";
-    default: return "a value of another kind";
+    case json::value_t::number_unsigned:
+        return "an integer (" + shown + ")";
+    case json::value_t::number_float:
+        return "a number with a fraction (" + shown + ")";
+    case json::value_t::string:
+        return "a string (" + shown + ")";
+    case json::value_t::array:
+        return "a list";
+    case json::value_t::object:
+        return "an object";
+    default:
+        return "a value of another kind";
     }
 }
 
@@ -59,8 +67,8 @@ int32_t ScenarioReader::Int(const json& value, const std::string& pointer, int64
                           std::to_string(high));
     int64_t number = value.get<int64_t>();
     if (number < low || number > high)
-        Fail(pointer, "the integer " + std::to_string(number) + " is out of range " + std::to_string(low) + ".." +
-                          std::to_string(high));
+        Fail(pointer, "the integer " + std::to_string(number) + " is out of range " + std::to_string(low) +
+                          ".." + std::to_string(high));
     return static_cast<int32_t>(number);
 }
 

@@ -14,9 +14,13 @@ namespace {
 
 class ReadableTimeline : public Timeline {
 public:
-    ReadableTimeline(std::ostream& out, bool colour, bool verbose) : out_(out), colour_(colour), verbose_(verbose) {}
+    ReadableTimeline(std::ostream& out, bool colour, bool verbose)
+        : out_(out), colour_(colour), verbose_(verbose)
+    {
+    }
 
-    void Begin(const std::string& scenario, const std::string& description, const std::string& module) override
+    void Begin(const std::string& scenario, const std::string& description,
+               const std::string& module) override
     {
         out_ << Paint(kBold, "steamext run: " + scenario) << "\n";
         if (!description.empty())
@@ -37,7 +41,8 @@ public:
         FlushGathered();
         if (!note.empty())
             out_ << Blank() << Paint(kDim, "# " + note) << "\n";
-        out_ << Prefix(at) << Paint(kBold, "#" + std::to_string(index) + " ") << Paint(kCyan, headline) << "\n";
+        out_ << Prefix(at) << Paint(kBold, "#" + std::to_string(index) + " ") << Paint(kCyan, headline)
+             << "\n";
         out_.flush();  // a step that waits shows what it waits for at once
     }
 
@@ -93,15 +98,17 @@ public:
     void End(const RunSummary& s) override
     {
         FlushGathered();
-        out_ << "\n" << Paint(kBold, "Summary") << "  (" << s.end.frame << " frames, engine clock " << s.end.clockMs
+        out_ << "\n"
+             << Paint(kBold, "Summary") << "  (" << s.end.frame << " frames, engine clock " << s.end.clockMs
              << " ms)\n";
         std::string events;
         for (const auto& entry : s.eventsByType)
-            events += (events.empty() ? "" : ", ") + ("type " + std::to_string(entry.first) + " x" +
-                                                      std::to_string(entry.second));
+            events += (events.empty() ? "" : ", ") +
+                      ("type " + std::to_string(entry.first) + " x" + std::to_string(entry.second));
         out_ << "  events posted     " << (events.empty() ? "none" : events) << "\n";
-        out_ << "  logged            " << Paint(s.warnings ? kYellow : "", std::to_string(s.warnings) + " warning(s)")
-             << ", " << Paint(s.errors ? kRed : "", std::to_string(s.errors) + " error(s)") << "\n";
+        out_ << "  logged            "
+             << Paint(s.warnings ? kYellow : "", std::to_string(s.warnings) + " warning(s)") << ", "
+             << Paint(s.errors ? kRed : "", std::to_string(s.errors) + " error(s)") << "\n";
         out_ << "  platform calls    " << s.platformCalls << (verbose_ ? "" : "  (-v lists them)") << "\n";
         out_ << "  expectations      " << Paint(kGreen, std::to_string(s.passed) + " passed") << ", "
              << Paint(s.failed ? kRed : "", std::to_string(s.failed) + " failed") << "\n";
@@ -129,7 +136,8 @@ private:
     std::string Prefix(const Moment& at) const
     {
         char buffer[48];
-        std::snprintf(buffer, sizeof buffer, "%6llu %7u ms  ", static_cast<unsigned long long>(at.frame), at.clockMs);
+        std::snprintf(buffer, sizeof buffer, "%6llu %7u ms  ", static_cast<unsigned long long>(at.frame),
+                      at.clockMs);
         return Paint(kDim, buffer);
     }
 
@@ -139,12 +147,14 @@ private:
     void FlushGathered()
     {
         if (repeats_ > 0)
-            out_ << Blank() << "  " << Paint(kDim, "... and " + std::to_string(repeats_) + " more time(s)") << "\n";
+            out_ << Blank() << "  " << Paint(kDim, "... and " + std::to_string(repeats_) + " more time(s)")
+                 << "\n";
         repeats_ = 0;
         repeated_.clear();
         if (buttons_.empty() && axes_.empty())
             return;
-        std::string line = "inputs cleared" + std::string(nonZero_ ? " (some to a value other than 0)" : "") + ":";
+        std::string line =
+            "inputs cleared" + std::string(nonZero_ ? " (some to a value other than 0)" : "") + ":";
         if (!buttons_.empty())
             line += " " + std::to_string(buttons_.size()) + " buttons " + IdRanges(buttons_) + ";";
         if (!axes_.empty())
@@ -171,7 +181,8 @@ class JsonTimeline : public Timeline {
 public:
     explicit JsonTimeline(std::ostream& out) : out_(out) {}
 
-    void Begin(const std::string& scenario, const std::string& description, const std::string& module) override
+    void Begin(const std::string& scenario, const std::string& description,
+               const std::string& module) override
     {
         Write({{"kind", "run"}, {"scenario", scenario}, {"description", description}, {"module", module}});
     }

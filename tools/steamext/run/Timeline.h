@@ -24,7 +24,7 @@ struct RunSummary {
     int warnings = 0;  // log lines of level 1
     int errors = 0;    // log lines of level 2
     int passed = 0;
-    int failed = 0;    // failed expectations and steps that could not run
+    int failed = 0;  // failed expectations and steps that could not run
     std::size_t platformCalls = 0;
     Moment end;
     std::vector<std::string> failures;
@@ -33,12 +33,13 @@ struct RunSummary {
 class Timeline {
 public:
     virtual ~Timeline() = default;
-    virtual void Begin(const std::string& scenario, const std::string& description, const std::string& module) = 0;
+    virtual void Begin(const std::string& scenario, const std::string& description,
+                       const std::string& module) = 0;
     // Something the runner does around the steps: loading the module, quitting.
     virtual void Phase(const Moment& at, const std::string& title) = 0;
     // A step, as one headline; `detail` is the machine form.
-    virtual void Step(const Moment& at, std::size_t index, const std::string& headline, const std::string& note,
-                      const nlohmann::json& detail) = 0;
+    virtual void Step(const Moment& at, std::size_t index, const std::string& headline,
+                      const std::string& note, const nlohmann::json& detail) = 0;
     // How a step that takes time ended ("arrived after 3 frames").
     virtual void Outcome(const Moment& at, const std::string& text) = 0;
     virtual void Record(const Moment& at, const nlohmann::json& record) = 0;

@@ -15,10 +15,14 @@ struct InterfaceName {
 };
 
 const InterfaceName kInterfaces[] = {
-    {"client", simclient::Interface::Client},       {"user", simclient::Interface::User},
-    {"utils", simclient::Interface::Utils},         {"apps", simclient::Interface::Apps},
-    {"friends", simclient::Interface::Friends},     {"user_stats", simclient::Interface::UserStats},
-    {"remote_storage", simclient::Interface::RemoteStorage}, {"ugc", simclient::Interface::UGC},
+    {"client", simclient::Interface::Client},
+    {"user", simclient::Interface::User},
+    {"utils", simclient::Interface::Utils},
+    {"apps", simclient::Interface::Apps},
+    {"friends", simclient::Interface::Friends},
+    {"user_stats", simclient::Interface::UserStats},
+    {"remote_storage", simclient::Interface::RemoteStorage},
+    {"ugc", simclient::Interface::UGC},
 };
 
 struct FaultKind {
@@ -72,14 +76,17 @@ WorldEdit ParseUser(const ScenarioReader& r, const json& value, const std::strin
     if (!value.contains("steam_id"))
         r.Fail(pointer, "a user needs \"steam_id\"");
     uint64 id = r.UInt64(value["steam_id"], ScenarioReader::Child(pointer, "steam_id"));
-    bool loggedOn = value.contains("logged_on") ? r.Bool(value["logged_on"], ScenarioReader::Child(pointer, "logged_on"))
-                                                : true;
-    std::string name = value.contains("name") ? r.String(value["name"], ScenarioReader::Child(pointer, "name"))
-                                              : std::string("Player");
+    bool loggedOn = value.contains("logged_on")
+                        ? r.Bool(value["logged_on"], ScenarioReader::Child(pointer, "logged_on"))
+                        : true;
+    std::string name = value.contains("name")
+                           ? r.String(value["name"], ScenarioReader::Child(pointer, "name"))
+                           : std::string("Player");
     return {"user " + Shown(value), [id, loggedOn, name](World& w) { w.SetLocalUser(id, loggedOn, name); }};
 }
 
-WorldEdit ParseStatsResult(const ScenarioReader& r, const json& value, const std::string& pointer, bool received)
+WorldEdit ParseStatsResult(const ScenarioReader& r, const json& value, const std::string& pointer,
+                           bool received)
 {
     // A result code, or {"result": code, "game_id": id} to answer for another game.
     int32_t result = 0;
@@ -122,7 +129,8 @@ WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::str
             std::string list;
             for (const auto& candidate : kFaultKinds)
                 list += std::string(list.empty() ? "" : ", ") + candidate.key;
-            r.Fail(ScenarioReader::Child(at, "kind"), "unknown fault kind \"" + kindName + "\"; expected one of: " + list);
+            r.Fail(ScenarioReader::Child(at, "kind"),
+                   "unknown fault kind \"" + kindName + "\"; expected one of: " + list);
         }
         simclient::Fault fault;
         fault.kind = kind->kind;
@@ -167,10 +175,25 @@ WorldEdit ParseCloudFiles(const ScenarioReader& r, const json& value, const std:
 std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, const std::string& pointer)
 {
     r.Object(world, pointer);
-    static const std::vector<std::string> kKeys = {
-        "steam_running", "init_succeeds", "interfaces", "user", "app_id", "overlay_enabled", "server_time",
-        "language", "branch", "latency", "stats", "achievements", "stats_received_result", "stats_stored_result",
-        "cloud_files", "clear_faults", "faults", "overlay_active", "warning"};
+    static const std::vector<std::string> kKeys = {"steam_running",
+                                                   "init_succeeds",
+                                                   "interfaces",
+                                                   "user",
+                                                   "app_id",
+                                                   "overlay_enabled",
+                                                   "server_time",
+                                                   "language",
+                                                   "branch",
+                                                   "latency",
+                                                   "stats",
+                                                   "achievements",
+                                                   "stats_received_result",
+                                                   "stats_stored_result",
+                                                   "cloud_files",
+                                                   "clear_faults",
+                                                   "faults",
+                                                   "overlay_active",
+                                                   "warning"};
     r.OnlyKeys(world, pointer, kKeys);
     std::vector<WorldEdit> edits;
     // Keys apply in the order of kKeys, whatever their order in the file: the
@@ -246,7 +269,8 @@ std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, co
         } else if (key == "overlay_active") {
             // The overlay opening or closing: the client posts its callback for the next pump.
             bool on = r.Bool(value, at);
-            edits.push_back({on ? "the overlay opens" : "the overlay closes", [on](World& w) { w.SetOverlayActive(on); }});
+            edits.push_back({on ? "the overlay opens" : "the overlay closes",
+                             [on](World& w) { w.SetOverlayActive(on); }});
         } else if (key == "warning") {
             std::string text = r.String(value, at);
             edits.push_back({"the client sends the warning " + Shown(value),

@@ -34,19 +34,26 @@ void RegisterAchievementOperations(OperationTable& table)
                    Achievements(t)->ReservedAction1();
                    return NoResult();
                }});
-    table.Add({"achievements.ReservedQuery", {}, ResultType::Bool,
-               [](const CallTarget& t, const Args&) { return BoolResult(Achievements(t)->ReservedQuery()); }});
+    table.Add({"achievements.ReservedQuery", {}, ResultType::Bool, [](const CallTarget& t, const Args&) {
+                   return BoolResult(Achievements(t)->ReservedQuery());
+               }});
     table.Add({"achievements.ReservedAction2", {}, ResultType::None, [](const CallTarget& t, const Args&) {
                    Achievements(t)->ReservedAction2();
                    return NoResult();
                }});
-    table.Add({"achievements.SetStatistic", {{"name", ArgType::Text}, {"value", ArgType::Int}}, ResultType::None,
+    table.Add({"achievements.SetStatistic",
+               {{"name", ArgType::Text}, {"value", ArgType::Int}},
+               ResultType::None,
                [](const CallTarget& t, const Args& a) {
                    Achievements(t)->SetStatistic(Text(a[0]), a[1].number);
                    return NoResult();
                }});
-    table.Add({"achievements.GetStatistic", {{"name", ArgType::Text}}, ResultType::Int,
-               [](const CallTarget& t, const Args& a) { return IntResult(Achievements(t)->GetStatistic(Text(a[0]))); }});
+    table.Add({"achievements.GetStatistic",
+               {{"name", ArgType::Text}},
+               ResultType::Int,
+               [](const CallTarget& t, const Args& a) {
+                   return IntResult(Achievements(t)->GetStatistic(Text(a[0])));
+               }});
 }
 
 }  // namespace steamext::run

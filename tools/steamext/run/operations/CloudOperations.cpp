@@ -30,7 +30,9 @@ void RegisterCloudOperations(OperationTable& table)
                [](const CallTarget& t, const Args& a) {
                    return BoolResult(Cloud(t)->WriteFile(Text(a[0]), a[1].bytes.data(), a[2].number));
                }});
-    table.Add({"cloud.ReadFile", {{"name", ArgType::Text}}, ResultType::Buffer,
+    table.Add({"cloud.ReadFile",
+               {{"name", ArgType::Text}},
+               ResultType::Buffer,
                [](const CallTarget& t, const Args& a) {
                    HostBuffer* buffer = Cloud(t)->ReadFile(Text(a[0]));
                    if (buffer == nullptr)
@@ -40,8 +42,11 @@ void RegisterCloudOperations(OperationTable& table)
                    t.host->ReleaseBuffer(buffer);
                    return CallResult{nlohmann::json::object({{"size", bytes.size()}}), bytes};
                }});
-    table.Add({"cloud.DeleteFile", {{"name", ArgType::Text}}, ResultType::Bool,
-               [](const CallTarget& t, const Args& a) { return BoolResult(Cloud(t)->DeleteFile(Text(a[0]))); }});
+    table.Add(
+        {"cloud.DeleteFile",
+         {{"name", ArgType::Text}},
+         ResultType::Bool,
+         [](const CallTarget& t, const Args& a) { return BoolResult(Cloud(t)->DeleteFile(Text(a[0]))); }});
 }
 
 }  // namespace steamext::run
