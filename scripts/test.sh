@@ -6,6 +6,9 @@ cd "$(dirname "$0")/.."
 scripts/setup.sh
 jobs=2
 
+echo "== format check"
+scripts/check_format.sh
+
 echo "== build and test (default)"
 cmake --preset default >/dev/null
 cmake --build --preset default -j$jobs
