@@ -72,3 +72,43 @@ enum HostLogLevel : int32_t {
 // The module-wide pointer to the engine's table: null until the first step of
 // ExtensionModule::Initialize, never cleared afterwards.
 extern HostServices* hostServices;
+
+// The engine finds each entry by its position: check every one, so that two
+// entries of the same signature swapped in the declarations fail to compile.
+#define HOST_TABLE_SLOT(Table, Entry, slot)                                                                  \
+    static_assert(offsetof(Table, Entry) == (slot) * sizeof(void*), #Table "::" #Entry " is entry " #slot)
+
+HOST_TABLE_SLOT(HostFileApi, FileClose, 0);
+HOST_TABLE_SLOT(HostFileApi, FileTell, 1);
+HOST_TABLE_SLOT(HostFileApi, FileOpen, 2);
+HOST_TABLE_SLOT(HostFileApi, FileRead, 3);
+HOST_TABLE_SLOT(HostFileApi, FileSeek, 4);
+static_assert(sizeof(HostFileApi) == 5 * sizeof(void*), "HostFileApi has five entries");
+
+HOST_TABLE_SLOT(HostThreadApi, StartThread, 0);
+HOST_TABLE_SLOT(HostThreadApi, CreateMutex, 1);
+HOST_TABLE_SLOT(HostThreadApi, LockMutex, 2);
+HOST_TABLE_SLOT(HostThreadApi, ThreadSleep, 3);
+HOST_TABLE_SLOT(HostThreadApi, UnlockMutex, 4);
+static_assert(sizeof(HostThreadApi) == 5 * sizeof(void*), "HostThreadApi has five entries");
+
+HOST_TABLE_SLOT(HostServices, CreateBuffer, 0);
+HOST_TABLE_SLOT(HostServices, Allocate, 1);
+HOST_TABLE_SLOT(HostServices, HostCommand, 2);
+HOST_TABLE_SLOT(HostServices, ReleaseBuffer, 3);
+HOST_TABLE_SLOT(HostServices, GetProductValue, 4);
+HOST_TABLE_SLOT(HostServices, GetTimeMs, 5);
+HOST_TABLE_SLOT(HostServices, IsQuitting, 6);
+HOST_TABLE_SLOT(HostServices, ReportError, 7);
+HOST_TABLE_SLOT(HostServices, Log, 8);
+HOST_TABLE_SLOT(HostServices, LogInfo, 9);
+HOST_TABLE_SLOT(HostServices, IsFeatureEnabled, 10);
+HOST_TABLE_SLOT(HostServices, PostEvent, 11);
+HOST_TABLE_SLOT(HostServices, SetInputAxis, 12);
+HOST_TABLE_SLOT(HostServices, SetInputButton, 13);
+HOST_TABLE_SLOT(HostServices, InitEvent, 14);
+HOST_TABLE_SLOT(HostServices, files, 15);
+HOST_TABLE_SLOT(HostServices, threads, 16);
+static_assert(sizeof(HostServices) == 17 * sizeof(void*), "HostServices has seventeen entries");
+
+#undef HOST_TABLE_SLOT
