@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
-# Every test: the suite, the suite again under AddressSanitizer+UBSan, the
-# threaded tests under ThreadSanitizer, and the fuzz targets for a bounded time.
+# Every test: the format check, the suite, clang-tidy's checks, the suite again under
+# AddressSanitizer+UBSan, the threaded tests under ThreadSanitizer, and the fuzz
+# targets for a bounded time.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 scripts/setup.sh
@@ -13,6 +14,9 @@ echo "== build and test (default)"
 cmake --preset default >/dev/null
 cmake --build --preset default -j$jobs
 ctest --preset default -j$jobs
+
+echo "== static checks (clang-tidy)"
+scripts/check_tidy.sh
 
 echo "== build and test (AddressSanitizer + UndefinedBehaviorSanitizer)"
 export ASAN_OPTIONS=detect_leaks=1:abort_on_error=1

@@ -37,7 +37,8 @@ InlineString::InlineString(const InlineString& other)
 
 InlineString& InlineString::operator=(const InlineString& other)
 {
-    Assign(other.text);
+    if (this != &other)
+        Assign(other.text);
     return *this;
 }
 

@@ -1,4 +1,7 @@
 // steamext: run scenarios against the built module, check and convert data files.
+#include <cstdio>
+#include <exception>
+
 #include <CLI/CLI.hpp>
 
 #include "Subcommands.h"
@@ -13,5 +16,11 @@ int main(int argc, char** argv)
     } catch (const CLI::ParseError& error) {
         return app.exit(error);
     }
-    return RunSelectedSubcommand(app);
+    try {
+        return RunSelectedSubcommand(app);
+    } catch (const std::exception& error) {
+        // Subcommands report their own faults; this is the last guard against a crash.
+        std::fprintf(stderr, "steamext: %s\n", error.what());
+        return 2;
+    }
 }
