@@ -7,6 +7,7 @@
 #include <steam/steam_api.h>
 
 #include "foundation/InlineString.h"
+#include "foundation/ListToken.h"
 #include "foundation/TextFormat.h"
 #include "frame/LanguageMapping.h"
 #include "frame/SteamManager.h"

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "foundation/TextFormat.h"
+#include "foundation/ListToken.h"
 
 namespace {
 
