@@ -138,8 +138,8 @@ XmlBlock* XmlReader::ReadAttributes(char* start)
             block.attributeValues[block.count] = value;
             ++block.count;
             if (block.count == XmlBlock::kMaxAttributes)
-                HostReportError(1, "Too many blocks (%d limit) in object '%s' in xml '%s'.", XmlBlock::kMaxAttributes,
-                                block.name, path);
+                HostReportError(1, "Too many blocks (%d limit) in object '%s' in xml '%s'.",
+                                XmlBlock::kMaxAttributes, block.name, path);
         }
 
         if (endByte == '\0')

@@ -77,16 +77,17 @@ public:
     bool active = false;
 
 private:
-    // The state of one ReadToken and its steps (XmlTokeniser.cpp).
+    // The state of one ReadToken and its steps, defined and inlined in
+    // XmlTokeniser.cpp and used nowhere else.
     struct TokenScan;
-    static int32_t CopyRun(TokenScan& s, unsigned char mask);
-    bool EndOfText(TokenScan& s);
-    bool TakeTagRun(TokenScan& s);
-    bool TakePlainRun(TokenScan& s);
-    bool TakeCdata(TokenScan& s, XmlBlock& target);
-    bool TakeQuotedByte(TokenScan& s, unsigned char c);
-    bool TakeTextByte(TokenScan& s, unsigned char c);
-    bool TakeTagByte(TokenScan& s, unsigned char c);
+    static inline int32_t CopyRun(TokenScan& s, unsigned char mask);
+    inline bool EndOfText(TokenScan& s);
+    inline bool TakeTagRun(TokenScan& s);
+    inline bool TakePlainRun(TokenScan& s);
+    inline bool TakeCdata(TokenScan& s, XmlBlock& target);
+    inline bool TakeQuotedByte(TokenScan& s, unsigned char c);
+    inline bool TakeTextByte(TokenScan& s, unsigned char c);
+    inline bool TakeTagByte(TokenScan& s, unsigned char c);
 
     // Takes ownership of `text` (size + 1 bytes, terminated): undoes an envelope,
     // then reads the declaration.

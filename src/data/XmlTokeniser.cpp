@@ -50,7 +50,7 @@ bool HasContent(const char* token, int32_t n)
 
 // Stores the run of bytes not of class `mask`, bounded by the room left in the
 // token, and returns the bound.
-int32_t XmlReader::CopyRun(TokenScan& s, unsigned char mask)
+[[gnu::always_inline]] inline int32_t XmlReader::CopyRun(TokenScan& s, unsigned char mask)
 {
     const int32_t stop = std::min(s.end, s.pos + (kTokenLimit - s.n));
     const int32_t runEnd = CopyPlain(s.text, s.pos, stop, mask, s.token + s.n);
@@ -59,7 +59,7 @@ int32_t XmlReader::CopyRun(TokenScan& s, unsigned char mask)
     return stop;
 }
 
-bool XmlReader::EndOfText(TokenScan& s)
+[[gnu::always_inline]] inline bool XmlReader::EndOfText(TokenScan& s)
 {
     if (s.pos < s.end)
         return false;
@@ -72,7 +72,7 @@ bool XmlReader::EndOfText(TokenScan& s)
 // whitespace, '=', quotes opened and quotes closed before an allowed byte. Each
 // stores at most one byte, so runs are bounded by the room left. Leaves at the
 // first byte that needs its full step, and behind a stored '-'.
-bool XmlReader::TakeTagRun(TokenScan& s)
+[[gnu::always_inline]] inline bool XmlReader::TakeTagRun(TokenScan& s)
 {
     for (;;) {
         if (AwaitsCommentCheck(s.token, s.n, true, s.inQuotes))
@@ -113,7 +113,7 @@ bool XmlReader::TakeTagRun(TokenScan& s)
 // Stores the run of plain bytes of the current state. A byte of a tag or of a
 // value dropped for want of room still ends its step, so the scan skips them;
 // text beyond the room is an error.
-bool XmlReader::TakePlainRun(TokenScan& s)
+[[gnu::always_inline]] inline bool XmlReader::TakePlainRun(TokenScan& s)
 {
     const unsigned char mask = StopMask(s.inTag, s.inQuotes);
     if (!AwaitsCommentCheck(s.token, s.n, s.inTag, s.inQuotes)) {
@@ -131,7 +131,7 @@ bool XmlReader::TakePlainRun(TokenScan& s)
 }
 
 // "<![CDATA[" in any state: the section's content is given in place, in the file text.
-bool XmlReader::TakeCdata(TokenScan& s, XmlBlock& target)
+[[gnu::always_inline]] inline bool XmlReader::TakeCdata(TokenScan& s, XmlBlock& target)
 {
     char* content = data + s.pos + 7;
     char* close = std::strstr(content, "]]>");
@@ -147,7 +147,7 @@ bool XmlReader::TakeCdata(TokenScan& s, XmlBlock& target)
     return true;
 }
 
-bool XmlReader::TakeQuotedByte(TokenScan& s, unsigned char c)
+[[gnu::always_inline]] inline bool XmlReader::TakeQuotedByte(TokenScan& s, unsigned char c)
 {
     if (c == '"' && !EndsWithEscape(s.token, s.n)) {
         s.inQuotes = false;
@@ -165,7 +165,7 @@ bool XmlReader::TakeQuotedByte(TokenScan& s, unsigned char c)
 
 // Text ends before a '<' when it holds more than whitespace; whitespace alone is
 // dropped and the tag begins.
-bool XmlReader::TakeTextByte(TokenScan& s, unsigned char c)
+[[gnu::always_inline]] inline bool XmlReader::TakeTextByte(TokenScan& s, unsigned char c)
 {
     if (c == '<') {
         if (HasContent(s.token, s.n)) {
@@ -193,7 +193,7 @@ bool XmlReader::TakeTextByte(TokenScan& s, unsigned char c)
     return false;
 }
 
-bool XmlReader::TakeTagByte(TokenScan& s, unsigned char c)
+[[gnu::always_inline]] inline bool XmlReader::TakeTagByte(TokenScan& s, unsigned char c)
 {
     if (Is(c, kWhite)) {
         if (DropsSpace(s.token, s.n))
@@ -254,8 +254,14 @@ bool XmlReader::TakeTagByte(TokenScan& s, unsigned char c)
 
 char* XmlReader::ReadToken(XmlBlock& target)
 {
-    TokenScan s{reinterpret_cast<const unsigned char*>(data), static_cast<int32_t>(size), cursor, tokenBuffer, 0,
-                false, false, nullptr};
+    TokenScan s{reinterpret_cast<const unsigned char*>(data),
+                static_cast<int32_t>(size),
+                cursor,
+                tokenBuffer,
+                0,
+                false,
+                false,
+                nullptr};
     if (s.pos >= s.end)
         return nullptr;
 
