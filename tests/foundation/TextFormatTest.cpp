@@ -3,7 +3,7 @@
 
 #include <gtest/gtest.h>
 
-#include "CountingTextHeap.h"
+#include "RefusingTextHeap.h"
 #include "foundation/TextFormat.h"
 
 namespace {
@@ -25,8 +25,7 @@ TEST(DuplicateText, CopiesAndTreatsNullAsEmpty)
     EXPECT_STREQ(empty, "");
     FreeText(empty);
 
-    CountingTextHeap heap;
-    heap.FailAll();
+    RefusingTextHeap heap;
     EXPECT_EQ(DuplicateText("abc"), nullptr);
 }
 
