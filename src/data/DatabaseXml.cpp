@@ -36,12 +36,11 @@ bool Database::LoadXmlWithRetry(const char* newPath)
     for (;;) {
         if (LoadXml(newPath))
             return true;
-        if (!HostCanCommand())
-            return false;
         const InlineString text =
             FormatString("CANCEL_TRY_CONTINUE,Failed to load XML file '%s'.", OrNull(newPath));
-        const char* answer = hostServices->HostCommand("ShowPopup", text.Text());
-        // Only the exact word tries again; any other answer, or none, gives up.
+        const char* answer = HostCommandIfPresent("ShowPopup", text.Text());
+        // Only the exact word tries again; any other answer, or none (no engine to
+        // ask), gives up.
         if (answer == nullptr || std::strcmp(answer, "TRY_AGAIN") != 0)
             return false;
     }

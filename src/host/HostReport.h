@@ -23,10 +23,18 @@ template <typename... Args> void HostLogInfo(const char* format, Args... args)
         hostServices->LogInfo(format, args...);
 }
 
-// True when hostServices->HostCommand may be called.
-inline bool HostCanCommand()
+template <typename... Args> void HostLog(int32_t level, const char* format, Args... args)
 {
-    return hostServices != nullptr && hostServices->HostCommand != nullptr;
+    if (hostServices != nullptr && hostServices->Log != nullptr)
+        hostServices->Log(level, format, args...);
+}
+
+// The engine's answer to `command`, or null when there is no engine to ask.
+inline const char* HostCommandIfPresent(const char* command, const char* argument)
+{
+    if (hostServices == nullptr || hostServices->HostCommand == nullptr)
+        return nullptr;
+    return hostServices->HostCommand(command, argument);
 }
 
 // The engine's file and thread tables, or null when there is no engine.
