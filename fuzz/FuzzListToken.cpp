@@ -3,7 +3,7 @@
 #include <string>
 #include <vector>
 
-#include "foundation/TextFormat.h"
+#include "foundation/ListToken.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {

@@ -1,21 +1,12 @@
 #include "data/CsvReader.h"
 
-#include "data/Database.h"
 #include "foundation/TextFormat.h"
 #include "foundation/TextHeap.h"
-
-namespace {
-
-HostFileApi* Files()
-{
-    return hostServices != nullptr ? hostServices->files : nullptr;
-}
-
-}  // namespace
+#include "host/HostReport.h"
 
 void CsvReader::Close()
 {
-    HostFileApi* files = Files();
+    HostFileApi* files = HostFiles();
     if (file != nullptr && files != nullptr && files->FileClose != nullptr)
         files->FileClose(file);
     file = nullptr;
@@ -31,7 +22,7 @@ unsigned char CsvReader::ReadByte()
     // A read that gives nothing leaves a zero byte; the position moves on anyway,
     // so a short file still comes to its end.
     unsigned char byte = 0;
-    Files()->FileRead(&byte, 1, file);
+    HostFiles()->FileRead(&byte, 1, file);
     ++position;
     return byte;
 }
@@ -60,7 +51,7 @@ bool CsvReader::Open(const char* path)
 {
     if (file != nullptr)
         Close();
-    HostFileApi* files = Files();
+    HostFileApi* files = HostFiles();
     if (files == nullptr || files->FileOpen == nullptr || files->FileRead == nullptr ||
         files->FileClose == nullptr || files->FileTell == nullptr || files->FileSeek == nullptr)
         return false;
@@ -94,38 +85,5 @@ bool CsvReader::Open(const char* path)
         const bool present = !AtEnd() && ReadField(name, kHeaderFieldLimit) == Field::Complete;
         columnNames[i] = DuplicateText(present ? name : "");
     }
-    return true;
-}
-
-bool Database::LoadCsv(const char* newPath)
-{
-    CsvReader reader;
-    if (!reader.Open(newPath)) {
-        if (hostServices != nullptr && hostServices->ReportError != nullptr)
-            hostServices->ReportError(1, "CSV Array File '%s' not found!",
-                                      newPath != nullptr ? newPath : "null");
-        reader.Close();
-        return false;
-    }
-
-    DataArray* array = AddArray();
-    int32_t rows = 0;
-    // Each node takes exactly columnCount fields, whichever separator ended them.
-    // With no column at all no field is ever read, so there are no rows either.
-    char field[CsvReader::kDataFieldLimit + 1];
-    while (reader.columnCount > 0 && !reader.AtEnd()) {
-        DataNode* node = array->AddNode();
-        ++rows;
-        node->ReserveValues(reader.columnCount);
-        for (int32_t i = 0; i < reader.columnCount; ++i) {
-            const bool present = !reader.AtEnd() && reader.ReadField(field, CsvReader::kDataFieldLimit) ==
-                                                        CsvReader::Field::Complete;
-            node->AddValue(reader.columnNames[i], present ? field : nullptr);
-        }
-    }
-    reader.Close();
-
-    if (hostServices != nullptr && hostServices->LogInfo != nullptr)
-        hostServices->LogInfo("%d CSV Arrays loaded with total %d nodes.", 1, rows);
     return true;
 }

@@ -38,8 +38,9 @@ public:
     // skipped. Null if there is none, or if `name` is null.
     const DataArray* FindArray(const char* name) const;
 
-    // Loading, implemented beside the readers: choose the reader by the path's
-    // ending, read an XML file (retrying through the engine's popup), or a CSV file.
+    // Loading. Load chooses the reader by the path's ending; the XML loader
+    // (DatabaseXml.cpp) retries through the engine's popup; the CSV loader is in
+    // DatabaseCsv.cpp.
     bool Load(const char* newPath);
     bool LoadXmlWithRetry(const char* newPath);
     bool LoadXml(const char* newPath);

@@ -9,7 +9,7 @@
 #include "data/Database.h"
 #include "data/XmlReader.h"
 #include "foundation/TextFormat.h"
-#include "host/HostServices.h"
+#include "host/HostReport.h"
 
 namespace {
 
@@ -29,12 +29,6 @@ bool IsId(const char* name)
     return name[0] == 'i' && name[1] == 'd' && name[2] == '\0';
 }
 
-template <typename... Args> void ReportLoadError(const char* format, Args... args)
-{
-    if (hostServices != nullptr && hostServices->ReportError != nullptr)
-        hostServices->ReportError(1, format, args...);
-}
-
 }  // namespace
 
 bool Database::LoadXmlWithRetry(const char* newPath)
@@ -42,12 +36,11 @@ bool Database::LoadXmlWithRetry(const char* newPath)
     for (;;) {
         if (LoadXml(newPath))
             return true;
-        if (hostServices == nullptr || hostServices->HostCommand == nullptr)
-            return false;
         const InlineString text =
             FormatString("CANCEL_TRY_CONTINUE,Failed to load XML file '%s'.", OrNull(newPath));
-        const char* answer = hostServices->HostCommand("ShowPopup", text.Text());
-        // Only the exact word tries again; any other answer, or none, gives up.
+        const char* answer = HostCommandIfPresent("ShowPopup", text.Text());
+        // Only the exact word tries again; any other answer, or none (no engine to
+        // ask), gives up.
         if (answer == nullptr || std::strcmp(answer, "TRY_AGAIN") != 0)
             return false;
     }
@@ -64,7 +57,7 @@ bool Database::ReadXmlBlocks(XmlReader& reader)
     const char* file = OrNull(reader.Path());
     int32_t nodeCount = 0;
     const auto fail = [this](auto... args) {
-        ReportLoadError(args...);
+        HostReportError(1, args...);
         Clear();
         return false;
     };

@@ -14,6 +14,10 @@
 // section, in the file text) and is overwritten by the next ReadBlock: callers
 // copy what they keep. Parsing is destructive: pieces of a tag are cut by
 // writing terminators into the token buffer.
+//
+// Files: XmlReader.cpp (opening, declaration, errors), XmlTokeniser.cpp (tokens),
+// XmlBlocks.cpp (blocks and attributes), XmlEscapes.cpp (value rewrites),
+// XmlCharClasses.h and XmlTokenRules.h (the byte classes and tag rules they share).
 #pragma once
 
 #include <cstdint>
@@ -73,6 +77,18 @@ public:
     bool active = false;
 
 private:
+    // The state of one ReadToken and its steps, defined and inlined in
+    // XmlTokeniser.cpp and used nowhere else.
+    struct TokenScan;
+    static inline int32_t CopyRun(TokenScan& s, unsigned char mask);
+    inline bool EndOfText(TokenScan& s);
+    inline bool TakeTagRun(TokenScan& s);
+    inline bool TakePlainRun(TokenScan& s);
+    inline bool TakeCdata(TokenScan& s, XmlBlock& target);
+    inline bool TakeQuotedByte(TokenScan& s, unsigned char c);
+    inline bool TakeTextByte(TokenScan& s, unsigned char c);
+    inline bool TakeTagByte(TokenScan& s, unsigned char c);
+
     // Takes ownership of `text` (size + 1 bytes, terminated): undoes an envelope,
     // then reads the declaration.
     bool AcceptText(char* text, int64_t textSize);

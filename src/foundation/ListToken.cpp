@@ -1,6 +1,6 @@
-#include <cstring>
+#include "foundation/ListToken.h"
 
-#include "foundation/TextFormat.h"
+#include <cstring>
 
 char* GetListToken(char* buffer, int32_t size, const char* list, const char* separator, int32_t index)
 {

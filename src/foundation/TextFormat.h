@@ -20,7 +20,3 @@ int32_t FormatToBufferV(char* buffer, int32_t size, const char* format, va_list 
 // As FormatToBuffer, but -1 when the text does not fit (termination not sure then).
 int32_t FormatToBufferRaw(char* buffer, int64_t size, const char* format, ...)
     __attribute__((format(printf, 3, 4)));
-
-// Copies token `index` of `list` split by the substring `separator` into `buffer`.
-// Returns `buffer`, or null for a missing token, a null argument or a token too long.
-char* GetListToken(char* buffer, int32_t size, const char* list, const char* separator, int32_t index);

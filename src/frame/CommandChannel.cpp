@@ -7,9 +7,11 @@
 #include <steam/steam_api.h>
 
 #include "foundation/InlineString.h"
+#include "foundation/ListToken.h"
 #include "foundation/TextFormat.h"
 #include "frame/LanguageMapping.h"
 #include "frame/SteamManager.h"
+#include "host/HostReport.h"
 #include "host/HostServices.h"
 #include "services/achievements/SteamAchievements.h"
 
@@ -69,8 +71,7 @@ const char* OpenStoreWithAppId(const char* argument)
     // Without the overlay the store opens as an address, with the token as written.
     char url[256];
     FormatToBuffer(url, sizeof url, "steam://purchase/%s", token.text != nullptr ? token.text : "");
-    if (hostServices != nullptr)  // a command sent before Initialize has no engine to ask
-        hostServices->HostCommand("OpenURL", url);
+    HostCommandIfPresent("OpenURL", url);  // before Initialize there is no engine to ask
     return nullptr;
 }
 

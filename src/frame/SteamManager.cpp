@@ -5,6 +5,7 @@
 #include "foundation/TextFormat.h"
 #include "frame/InputReset.h"
 #include "host/HostEvent.h"
+#include "host/HostReport.h"
 #include "host/HostServices.h"
 #include "services/achievements/SteamAchievements.h"
 
@@ -18,8 +19,7 @@ char startupPlayerId[64];
 extern "C" void S_CALLTYPE SteamWarningHook(int severity, const char* text)
 {
     (void)severity;
-    if (hostServices != nullptr)
-        hostServices->Log(kHostLogInfo, "STEAM: %s", text);
+    HostLog(kHostLogInfo, "STEAM: %s", text);
 }
 
 }  // namespace

@@ -3,7 +3,7 @@
 
 #include <gtest/gtest.h>
 
-#include "../foundation/CountingTextHeap.h"
+#include "../foundation/RefusingTextHeap.h"
 #include "data/DataArray.h"
 #include "data/DataNode.h"
 #include "data/Database.h"
@@ -136,21 +136,6 @@ TEST(DataNode, AddValueStoresPrivateCopiesInFileOrder)
     EXPECT_STREQ(node.id.text, "n");
 }
 
-TEST(DataNode, HeapExhaustionGivesNullTextsThatLookupsSkip)
-{
-    // Catches a lookup that dereferences a name the heap refused to copy.
-    DataNode node;
-    {
-        CountingTextHeap heap;
-        heap.FailAll();
-        node.AddValue("a", "b");
-    }
-    ASSERT_EQ(node.values.count, 1);
-    EXPECT_EQ(node.values[0].name.text, nullptr);
-    EXPECT_EQ(node.GetValue("a"), nullptr);
-    EXPECT_EQ(node.GetValue(""), nullptr);
-}
-
 TEST(DataArray, FindNode)
 {
     // Catches a null id taken as the empty one (both hash to 0), and a hash-only match.
@@ -199,30 +184,36 @@ TEST(DataArray, FindNodeWithoutNodesOrArray)
 
 TEST(DataArray, SetValue)
 {
-    // Catches "id" stored as a pair, a null value that erases, or a repeat that appends.
-    DataArray array;
-    array.SetValue("id", "first");
-    array.SetValue("kind", "a");
-    array.SetValue("id", "board");
-    array.SetValue("kind", "b");
-    array.SetValue("kind", nullptr);
-    array.SetValue("empty", nullptr);
-    array.SetValue(nullptr, "ignored");
-    array.SetValue("Kind", "c");
+    // Catches "id" stored as a pair, a null value that erases, a repeat that
+    // appends, and a replaced value freed to the wrong place (heap or arena, ASan).
+    Database database;
+    DataArray onHeap;
+    for (DataArray* each : {&onHeap, database.AddArray()}) {
+        SCOPED_TRACE(each == &onHeap ? "heap" : "arena");
+        DataArray& array = *each;
+        array.SetValue("id", "first");
+        array.SetValue("kind", "a");
+        array.SetValue("id", "board");
+        array.SetValue("kind", "b");
+        array.SetValue("kind", nullptr);
+        array.SetValue("empty", nullptr);
+        array.SetValue(nullptr, "ignored");
+        array.SetValue("Kind", "c");
 
-    EXPECT_STREQ(array.name.text, "board");
-    EXPECT_EQ(array.name.hash, HashText("board"));
-    ASSERT_EQ(array.values.count, 3);
-    EXPECT_STREQ(array.values[0].name.text, "kind");
-    EXPECT_STREQ(array.values[0].value, "b");
-    EXPECT_STREQ(array.values[1].name.text, "empty");
-    EXPECT_EQ(array.values[1].value, nullptr);
-    EXPECT_STREQ(array.values[2].name.text, "Kind");
+        EXPECT_STREQ(array.name.text, "board");
+        EXPECT_EQ(array.name.hash, HashText("board"));
+        ASSERT_EQ(array.values.count, 3);
+        EXPECT_STREQ(array.values[0].name.text, "kind");
+        EXPECT_STREQ(array.values[0].value, "b");
+        EXPECT_STREQ(array.values[1].name.text, "empty");
+        EXPECT_EQ(array.values[1].value, nullptr);
+        EXPECT_STREQ(array.values[2].name.text, "Kind");
 
-    array.SetValue("empty", "now");
-    EXPECT_STREQ(array.values[1].value, "now");
-    array.SetValue("id", nullptr);
-    EXPECT_EQ(array.name.text, nullptr);
+        array.SetValue("empty", "now");
+        EXPECT_STREQ(array.values[1].value, "now");
+        array.SetValue("id", nullptr);
+        EXPECT_EQ(array.name.text, nullptr);
+    }
 }
 
 TEST(Database, FindArray)
@@ -251,23 +242,73 @@ TEST(Database, FindArray)
     EXPECT_NE(nameless, a2);
 }
 
-TEST(Database, ClearKeepsPathAndBlock)
+TEST(Database, ClearGivesTheTreeBackAndKeepsPathAndBlock)
 {
-    // Catches a Clear that frees the block or the path, or leaves arrays findable.
+    // Catches a Clear that frees the array block or the path, keeps (or loses track
+    // of) the arena's chunks, or leaves arrays findable, and a rebuilt tree that
+    // reads stale memory (under ASan).
     Database database;
-    database.SetPath("x.xml");
-    database.AddArray()->SetName("A");
-    database.AddArray()->AddNode()->AddValue("k", "v");
-    DataArray** block = database.arrays.data;
-    database.Clear();
-    EXPECT_EQ(database.arrays.count, 0);
-    EXPECT_EQ(database.arrays.data, block);
-    EXPECT_STREQ(database.path.text, "x.xml");
-    for (const char* name : {"A", "", "x"})
-        EXPECT_EQ(database.FindArray(name), nullptr) << name;
+    database.SetPath("boards.xml");
+    for (int round = 0; round < 2; ++round) {
+        SCOPED_TRACE(round);
+        DataArray* array = database.AddArray();
+        array->SetName("boards");
+        for (int n = 0; n < 500; ++n) {
+            const std::string id = "board_" + std::to_string(n);
+            DataNode* node = array->AddNode();
+            node->SetId(id.c_str());
+            node->AddValue("sort", n % 2 ? "ascending" : "descending");
+        }
+        // Pairs that outgrow their block move within the arena, never through the heap.
+        DataNode* grown = array->nodes[1];
+        for (int k = 0; k < 10; ++k)
+            grown->AddValue(("k" + std::to_string(k)).c_str(), "v");
+        EXPECT_STREQ(grown->GetValue("k9"), "v");
+        // An id set from its own text must not read a released copy.
+        array->nodes[0]->SetId(array->nodes[0]->id.text + 2);
+        EXPECT_STREQ(array->nodes[0]->id.text, "ard_0");
+        EXPECT_EQ(array->nodes[0]->id.hash, HashText("ard_0"));
+        ASSERT_EQ(DataArray::FindNode(database.FindArray("boards"), "board_499"), array->nodes[499]);
+        EXPECT_STREQ(array->nodes[499]->GetValue("sort"), "ascending");
+        EXPECT_GT(database.arena.ChunkCount(), 0);
 
-    database.AddArray()->SetName("again");
-    EXPECT_NE(database.FindArray("again"), nullptr);
+        DataArray** block = database.arrays.data;
+        database.Clear();
+        EXPECT_EQ(database.arena.ChunkCount(), 0);
+        EXPECT_EQ(database.arrays.count, 0);
+        EXPECT_EQ(database.arrays.data, block);
+        EXPECT_STREQ(database.path.text, "boards.xml");
+        for (const char* name : {"boards", ""})
+            EXPECT_EQ(database.FindArray(name), nullptr) << name;
+    }
+}
+
+TEST(Database, RefusedTextsAreNullAndSkipped)
+{
+    // Catches a copy that is hashed or read although the heap refused it, and a
+    // lookup that dereferences such a name.
+    Database database;
+    DataArray* array = database.AddArray();
+    DataNode* node = array->AddNode();
+    {
+        RefusingTextHeap heap;
+        array->SetName("A");
+        array->SetValue("k", "v");
+        node->SetId("x");
+        node->AddValue("a", "b");
+    }
+    EXPECT_EQ(array->name.text, nullptr);
+    ASSERT_EQ(array->values.count, 1);
+    EXPECT_EQ(array->values[0].name.text, nullptr);
+    EXPECT_EQ(array->values[0].value, nullptr);
+    EXPECT_EQ(node->id.text, nullptr);
+    EXPECT_EQ(node->id.hash, 0u);
+    ASSERT_EQ(node->values.count, 1);
+    EXPECT_EQ(node->values[0].name.text, nullptr);
+    EXPECT_EQ(node->GetValue("a"), nullptr);
+    EXPECT_EQ(node->GetValue(""), nullptr);
+    EXPECT_EQ(array->FindNode(""), nullptr);
+    EXPECT_EQ(database.FindArray(""), nullptr);
 }
 
 }  // namespace

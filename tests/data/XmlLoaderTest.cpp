@@ -1,5 +1,5 @@
 // Loading XML databases through the engine's files: the root/array/node shape,
-// messages M1 to M9, the envelope, and the retry popup.
+// the loader's messages, the envelope, and the retry popup.
 #include <optional>
 #include <string>
 #include <vector>
@@ -70,36 +70,39 @@ Load LoadFile(const std::string& bytes, std::vector<std::optional<std::string>> 
     return result;
 }
 
-std::string M1(const char* name)
+std::string NotInRoot(const char* name)
 {
     return std::string(
                "DataManager: XML database needs to be contained within 'root' block (not expecting '") +
            name + "'). 'd.xml' is invalid.";
 }
-const std::string M2 = "DataManager: XML database needs to end with root block closing. 'd.xml' is invalid.";
-const std::string M3 = "DataManager: No blocks can exist after </root>. 'd.xml' is invalid.";
-std::string M4(const char* name)
+const std::string kNoRootClosing =
+    "DataManager: XML database needs to end with root block closing. 'd.xml' is invalid.";
+const std::string kBlockAfterRoot = "DataManager: No blocks can exist after </root>. 'd.xml' is invalid.";
+std::string NotAnArray(const char* name)
 {
     return std::string("DataManager: root/array/node structure violated. '") + name +
            "' is not 'array'. 'd.xml' is invalid.";
 }
-const std::string M5 = "DataManager: File 'd.xml' ends unexpectedly. Not loaded.";
-const std::string M6 = "DataManager: File 'd.xml' has enclosing arrays which is not supported. Not loaded.";
-std::string M7(const char* name)
+const std::string kEndsUnexpectedly = "DataManager: File 'd.xml' ends unexpectedly. Not loaded.";
+const std::string kEnclosingArrays =
+    "DataManager: File 'd.xml' has enclosing arrays which is not supported. Not loaded.";
+std::string NotArrayOrNode(const char* name)
 {
     return std::string(
                "DataManager: in 'd.xml' is expecting to find two types of elements inside root: 'array' and "
                "'node'. '") +
            name + "' is not one of them.";
 }
-std::string M8(int count, const char* id)
+std::string ErrorAfterNode(int count, const char* id)
 {
     return "DataManager: error parsing file 'd.xml' after node #" + std::to_string(count) + " with id '" +
            id + "'.";
 }
-std::string M9(int count, const char* id)
+std::string StructureAfterNode(int count, const char* id)
 {
-    return M8(count, id).substr(0, M8(count, id).size() - 1) + ". Basic root/array/node structure violated.";
+    return ErrorAfterNode(count, id).substr(0, ErrorAfterNode(count, id).size() - 1) +
+           ". Basic root/array/node structure violated.";
 }
 
 struct Row {
@@ -165,41 +168,50 @@ TEST(XmlLoader, Shapes)
 
 TEST(XmlLoader, Refusals)
 {
-    // Catches a wrong message, a wrong count or id in M8/M9, a partial tree left
+    // Catches a wrong message, a wrong count or id in ErrorAfterNode/StructureAfterNode, a partial tree left
     // behind, and a refusal without its popup.
     const std::string A = "<root><array id=\"A\">";
     const std::string Z = "</array></root>";
     const Row rows[] = {
-        {"M1 self-closing root", "<root/>", "", {M1("root")}},
-        {"M1 other element", "<base></base>", "", {M1("base")}},
-        {"M1 text first", "text<root></root>", "", {M1("null")}},
-        {"M1 no block at all", "", "", {M1("null")}},
-        {"M2 root then end", "<root>", "", {M2}},
-        {"M2 missing </root>", A + "<node id=\"a\"/></array>", "", {M2}},
-        {"M2 after a </array> at top level", "<root></array>", "", {M2}},
-        {"M3 tag behind </root>", "<root></root><x>", "", {M3}},
-        {"M3 text then tag behind </root>", "<root></root> t <x>", "", {M3}},
-        {"M4", "<root><node id=\"a\"/></root>", "", {M4("node")}},
-        {"M4 open root again", "<root><root>", "", {M4("root")}},
-        {"M4 text", "<root>t<array>", "", {M4("null")}},
-        {"M5", A + "\n", "", {M5}},
-        {"M6", A + "<array id=\"B\">\n", "", {M6}},
-        {"M7 other element", A + "<item/>" + Z, "", {M7("item")}},
-        {"M7 </root> inside an array", A + "</root>", "", {M7("root")}},
-        {"M7 second text behind a node", A + "<node id=\"a\">one</node>two<node/>" + Z, "", {M7("null")}},
-        {"M8 no block behind node", A + "<node id=\"a\">\n", "", {M8(1, "a")}},
-        {"M8 counts over arrays, null id",
+        {"NotInRoot self-closing root", "<root/>", "", {NotInRoot("root")}},
+        {"NotInRoot other element", "<base></base>", "", {NotInRoot("base")}},
+        {"NotInRoot text first", "text<root></root>", "", {NotInRoot("null")}},
+        {"NotInRoot no block at all", "", "", {NotInRoot("null")}},
+        {"NoRootClosing root then end", "<root>", "", {kNoRootClosing}},
+        {"NoRootClosing missing </root>", A + "<node id=\"a\"/></array>", "", {kNoRootClosing}},
+        {"NoRootClosing after a </array> at top level", "<root></array>", "", {kNoRootClosing}},
+        {"BlockAfterRoot tag behind </root>", "<root></root><x>", "", {kBlockAfterRoot}},
+        {"BlockAfterRoot text then tag behind </root>", "<root></root> t <x>", "", {kBlockAfterRoot}},
+        {"NotAnArray", "<root><node id=\"a\"/></root>", "", {NotAnArray("node")}},
+        {"NotAnArray open root again", "<root><root>", "", {NotAnArray("root")}},
+        {"NotAnArray text", "<root>t<array>", "", {NotAnArray("null")}},
+        {"EndsUnexpectedly", A + "\n", "", {kEndsUnexpectedly}},
+        {"EnclosingArrays", A + "<array id=\"B\">\n", "", {kEnclosingArrays}},
+        {"NotArrayOrNode other element", A + "<item/>" + Z, "", {NotArrayOrNode("item")}},
+        {"NotArrayOrNode </root> inside an array", A + "</root>", "", {NotArrayOrNode("root")}},
+        {"NotArrayOrNode second text behind a node",
+         A + "<node id=\"a\">one</node>two<node/>" + Z,
+         "",
+         {NotArrayOrNode("null")}},
+        {"ErrorAfterNode no block behind node", A + "<node id=\"a\">\n", "", {ErrorAfterNode(1, "a")}},
+        {"ErrorAfterNode counts over arrays, null id",
          A + "<node id=\"a\"/></array><array><node/><node>\n",
          "",
-         {M8(3, "null")}},
-        {"M9 open node then </array>", A + "<node id=\"a\"></array></root>", "", {M9(1, "a")}},
-        {"M9 open node then open node", A + "<node id=\"a\"><node id=\"b\">" + Z, "", {M9(1, "a")}},
-        {"parse error then M5",
+         {ErrorAfterNode(3, "null")}},
+        {"StructureAfterNode open node then </array>",
+         A + "<node id=\"a\"></array></root>",
+         "",
+         {StructureAfterNode(1, "a")}},
+        {"StructureAfterNode open node then open node",
+         A + "<node id=\"a\"><node id=\"b\">" + Z,
+         "",
+         {StructureAfterNode(1, "a")}},
+        {"parse error then kEndsUnexpectedly",
          A + "<<",
          "",
          {"Parsing error (not expecting another '<') around line 2 in XML 'd.xml'. Unexpected character '<' "
           "(3c) at:\n'<'",
-          M5}},
+          kEndsUnexpectedly}},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.name);
@@ -238,7 +250,7 @@ TEST(XmlLoader, RetryPopup)
     const std::string bad = kDecl + "<root>";
     const Load gaveUp = LoadFile(bad, {std::string("TRY_AGAIN"), std::string("try_again")});
     EXPECT_FALSE(gaveUp.loaded);
-    EXPECT_EQ(gaveUp.reports, (std::vector<std::string>{M2, M2}));
+    EXPECT_EQ(gaveUp.reports, (std::vector<std::string>{kNoRootClosing, kNoRootClosing}));
     EXPECT_EQ(gaveUp.popups, (std::vector<std::string>{kPopup, kPopup}));
 
     EXPECT_EQ(LoadFile(bad, {std::nullopt}).popups.size(), 1u);
@@ -373,7 +385,7 @@ TEST(XmlLoader, ShortReadAndFailedOpen)
     Database database;
     EXPECT_FALSE(database.Load(kPath.c_str()));
     EXPECT_EQ(engine.Records().All().Logs(simengine::LogKind::Report).size(), 1u);
-    EXPECT_EQ(engine.Records().All().Logs(simengine::LogKind::Report)[0].text, M2);
+    EXPECT_EQ(engine.Records().All().Logs(simengine::LogKind::Report)[0].text, kNoRootClosing);
 }
 
 }  // namespace

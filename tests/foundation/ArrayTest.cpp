@@ -1,6 +1,7 @@
 #include <cstddef>
 #include <cstring>
 #include <new>
+#include <string>
 
 #include <gtest/gtest.h>
 
@@ -31,6 +32,8 @@ int* Slot(int i)
     return &slots[i];
 }
 
+int* const slotZero = &slots[0];
+
 void Fill(PtrArray<int>& array, int n)
 {
     for (int i = 0; i < n; ++i)
@@ -44,21 +47,12 @@ void ExpectInOrder(const PtrArray<int>& array, int n)
         EXPECT_EQ(array.data[i], Slot(i)) << "index " << i;
 }
 
-TEST(PtrArray, ZeroedHeaderTakesAFirstBlockOf32)
-{
-    // Catches a first allocation sized by the growth rule instead of the fixed 32.
-    PtrArray<int> array;
-    EXPECT_EQ(array.data, nullptr);
-    EXPECT_EQ(array.count, 0);
-    EXPECT_EQ(array.capacity, 0);
-    EXPECT_FALSE(array.autoShrink);
-    array.Add(Slot(0));
-    EXPECT_EQ(array.capacity, 32);
-    ExpectInOrder(array, 1);
-}
-
 TEST(PtrArray, GrowthSteps)
 {
+    // Catches a first block not of the fixed 32, a wrong step, arena blocks that
+    // grow by another rule, and an item read from the array's own old block after
+    // that block was freed or overwritten: the last add of each row, at the step,
+    // is the array's own first element.
     struct Row {
         const char* name;
         int32_t reserve;  // -1: none
@@ -66,6 +60,7 @@ TEST(PtrArray, GrowthSteps)
         int32_t capacity;
     };
     const Row rows[] = {
+        {"a zeroed header takes a first block of 32", -1, 1, 32},
         {"32 fit the first block", -1, 32, 32},
         {"the 33rd doubles", -1, 33, 64},
         {"the 65th doubles again", -1, 65, 128},
@@ -73,57 +68,36 @@ TEST(PtrArray, GrowthSteps)
         {"then doubles", 1, 9, 16},
         {"a block of 3 doubles", 3, 4, 6},
     };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.name);
-        PtrArray<int> array;
-        if (row.reserve >= 0)
-            array.Reserve(row.reserve);
-        Fill(array, row.adds);
-        EXPECT_EQ(array.capacity, row.capacity);
-        ExpectInOrder(array, row.adds);
-
-        // Blocks from an arena follow the very same steps.
-        BlockArena arena;
-        PtrArray<int> inArena;
-        if (row.reserve >= 0)
-            inArena.Reserve(row.reserve, arena);
-        for (int i = 0; i < row.adds; ++i)
-            inArena.Add(Slot(i), arena);
-        EXPECT_EQ(inArena.capacity, row.capacity);
-        ExpectInOrder(inArena, row.adds);
-        inArena.ForgetBlock();
-    }
-}
-
-TEST(PtrArray, AddOfOwnElementAtGrowth)
-{
-    // Catches a copy of the item taken after the old block was freed (ASan) or overwritten.
-    PtrArray<int> array;
-    Fill(array, 32);
-    array.Add(array.data[5]);
-    EXPECT_EQ(array.capacity, 64);
-    EXPECT_EQ(array.data[32], Slot(5));
-
-    PtrArray<int> single;
-    single.Reserve(1);
-    single.Add(Slot(7));
-    single.Add(single.data[0]);
-    EXPECT_EQ(single.data[1], Slot(7));
-
     BlockArena arena;
-    PtrArray<int> inArena;
-    inArena.Reserve(1, arena);
-    inArena.Add(Slot(7), arena);
-    inArena.Add(inArena.data[0], arena);
-    EXPECT_EQ(inArena.capacity, 8);
-    EXPECT_EQ(inArena.data[1], Slot(7));
-    inArena.ForgetBlock();
+    for (const Row& row : rows) {
+        for (bool inArena : {false, true}) {
+            SCOPED_TRACE(std::string(row.name) + (inArena ? " (arena)" : " (heap)"));
+            PtrArray<int> array;
+            if (row.reserve >= 0)
+                inArena ? array.Reserve(row.reserve, arena) : array.Reserve(row.reserve);
+            for (int i = 0; i < row.adds - 1; ++i)
+                inArena ? array.Add(Slot(i), arena) : array.Add(Slot(i));
+            // By reference into the block that the add may replace.
+            int* const& last = row.adds > 1 ? array.data[0] : slotZero;
+            inArena ? array.Add(last, arena) : array.Add(last);
+            EXPECT_EQ(array.capacity, row.capacity);
+            ASSERT_EQ(array.count, row.adds);
+            for (int i = 0; i < row.adds - 1; ++i)
+                EXPECT_EQ(array.data[i], Slot(i)) << "index " << i;
+            EXPECT_EQ(array.data[row.adds - 1], Slot(0));
+            if (inArena)
+                array.ForgetBlock();
+        }
+    }
 }
 
 TEST(PtrArray, Reserve)
 {
     // Catches a Reserve that drops elements when asked for less than count.
     PtrArray<int> array;
+    EXPECT_EQ(array.count, 0);
+    EXPECT_EQ(array.capacity, 0);
+    EXPECT_FALSE(array.autoShrink);
     array.Reserve(0);
     EXPECT_EQ(array.data, nullptr);  // equal to capacity: nothing at all
 

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "foundation/TextFormat.h"
+#include "foundation/ListToken.h"
 
 namespace {
 
@@ -46,46 +46,44 @@ TEST(GetListToken, Tokens)
     }
 }
 
-TEST(GetListToken, NullArguments)
+TEST(GetListToken, BufferSizeAndNullArguments)
 {
-    char buffer[8] = "keep";
-    EXPECT_EQ(GetListToken(buffer, sizeof buffer, nullptr, ",", 0), nullptr);
-    EXPECT_EQ(GetListToken(buffer, sizeof buffer, "a,b", nullptr, 0), nullptr);
-    EXPECT_STREQ(buffer, "keep");
-}
-
-TEST(GetListToken, BufferSize)
-{
-    // Catches a size check off by one, or a write past `size` bytes.
+    // Catches a size check off by one, a write past `size` bytes (a terminator
+    // written into a buffer of size 0 too), and a null list or separator read.
     struct Row {
+        const char* name;
+        const char* list;
+        const char* separator;
         int32_t size;
-        bool found;
+        const char* expected;  // null: no token
     };
-    const Row rows[] = {{-1, false}, {0, false}, {3, false}, {4, true}, {5, true}};
+    const Row rows[] = {
+        {"negative size", "x,abc,y", ",", -1, nullptr},
+        {"no room", "x,abc,y", ",", 0, nullptr},
+        {"no room for the terminator", "x,abc,y", ",", 3, nullptr},
+        {"exact room", "x,abc,y", ",", 4, "abc"},
+        {"room to spare", "x,abc,y", ",", 5, "abc"},
+        {"trailing separator, no room", "a,", ",", 0, nullptr},
+        {"trailing separator, room for the terminator", "a,", ",", 1, ""},
+        {"null list", nullptr, ",", 8, nullptr},
+        {"null separator", "a,b", nullptr, 8, nullptr},
+    };
     for (const Row& row : rows) {
-        SCOPED_TRACE(row.size);
+        SCOPED_TRACE(row.name);
         char buffer[8];
         std::memset(buffer, kMarker, sizeof buffer);
-        const char* result = GetListToken(buffer, row.size, "x,abc,y", ",", 1);
-        EXPECT_EQ(result != nullptr, row.found);
-        if (row.found) {
-            EXPECT_STREQ(buffer, "abc");
+        const char* result = GetListToken(buffer, row.size, row.list, row.separator, 1);
+        int32_t firstUntouched = 0;
+        if (row.expected == nullptr) {
+            EXPECT_EQ(result, nullptr);
+        } else {
+            ASSERT_EQ(result, buffer);
+            EXPECT_STREQ(buffer, row.expected);
+            firstUntouched = static_cast<int32_t>(std::strlen(row.expected)) + 1;
         }
-        const int32_t firstUntouched = row.found ? 4 : 0;
         for (int32_t i = firstUntouched; i < 8; ++i)
             EXPECT_EQ(buffer[i], kMarker) << "byte " << i;
     }
-}
-
-TEST(GetListToken, TrailingSeparatorWithNoRoom)
-{
-    // Catches a terminator written into a buffer of size 0.
-    char buffer[2] = {kMarker, kMarker};
-    EXPECT_EQ(GetListToken(buffer, 0, "a,", ",", 1), nullptr);
-    EXPECT_EQ(buffer[0], kMarker);
-    EXPECT_EQ(GetListToken(buffer, 1, "a,", ",", 1), buffer);
-    EXPECT_EQ(buffer[0], '\0');
-    EXPECT_EQ(buffer[1], kMarker);
 }
 
 }  // namespace
