@@ -7,7 +7,8 @@
 #include "run/JsonLocator.h"
 #include "run/Records.h"
 #include "run/Scenario.h"
-#include "run/ScenarioReader.h"
+#include "run/ScenarioFile.h"
+#include "run/ScenarioParser.h"
 
 namespace steamext::run {
 namespace {
@@ -191,7 +192,7 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
          "steps[0].args.dat: \"cloud.WriteFile\" has no argument \"dat\""},
         {"{\"steps\": [{\"call\": \"GetName\", \"expect\": 3}]}",
          "steps[0].expect: expected a string, got an integer"},
-        {"{\"steps\": [{\"frames\": 1, \"expect\": true}]}", "needs \"call\" in the same step"},
+        {"{\"steps\": [{\"frames\": 1, \"expect\": true}]}", "needs \"call\" or \"read\" in the same step"},
         {"{\"steps\": [{\"wait_for\": {\"event\": 17, \"log\": \"x\"}}]}", "wait for exactly one thing"},
         {"{\"steps\": [{\"logs\": [{}]}]}", "steps[0].logs[0]: an empty pattern matches anything"},
         {"{\"steps\": [{\"inputs\": {\"keys\": \"1\"}}]}", "steps[0].inputs.keys: unknown key"},
