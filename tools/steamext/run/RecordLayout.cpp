@@ -12,16 +12,14 @@ using nlohmann::json;
 
 namespace {
 
-template <class T>
-T Load(const unsigned char* at)
+template <class T> T Load(const unsigned char* at)
 {
     T value;
     std::memcpy(&value, at, sizeof(T));
     return value;
 }
 
-template <class T>
-void Store(unsigned char* at, T value)
+template <class T> void Store(unsigned char* at, T value)
 {
     std::memcpy(at, &value, sizeof(T));
 }
@@ -95,7 +93,8 @@ json DecodeField(const RecordField& field, const unsigned char* place)
         return text != nullptr ? json(std::string(text)) : json(nullptr);
     }
     case FieldKind::FixedText:
-        return std::string(reinterpret_cast<const char*>(place), strnlen(reinterpret_cast<const char*>(place), field.count));
+        return std::string(reinterpret_cast<const char*>(place),
+                           strnlen(reinterpret_cast<const char*>(place), field.count));
     case FieldKind::Int32:
         return Load<int32_t>(place);
     case FieldKind::UInt32:
@@ -128,8 +127,8 @@ json DecodeRecord(const RecordLayout& layout, const void* record)
     return fields;
 }
 
-std::shared_ptr<RecordBuffer> EncodeRecord(const RecordLayout& layout, const json& fields, const ScenarioFile& file,
-                                           const std::string& pointer)
+std::shared_ptr<RecordBuffer> EncodeRecord(const RecordLayout& layout, const json& fields,
+                                           const ScenarioFile& file, const std::string& pointer)
 {
     file.Object(fields, pointer);
     auto record = std::make_shared<RecordBuffer>(layout.size);

@@ -68,16 +68,16 @@ constexpr std::size_t FieldSize(const RecordField& field)
 
 // Every field lies inside `size` bytes, aligned to its own size (texts and
 // bytes excepted), and no two fields overlap.
-template <std::size_t N>
-constexpr bool FieldsFit(const RecordField (&fields)[N], std::size_t size)
+template <std::size_t N> constexpr bool FieldsFit(const RecordField (&fields)[N], std::size_t size)
 {
     for (std::size_t i = 0; i < N; ++i) {
         const std::size_t end = fields[i].offset + FieldSize(fields[i]);
         if (FieldSize(fields[i]) == 0 || end > size)
             return false;
-        const std::size_t align = fields[i].kind == FieldKind::FixedText || fields[i].kind == FieldKind::Bool8 ? 1
-                                  : fields[i].kind == FieldKind::Int32Array                                     ? 4
-                                                                                         : FieldSize(fields[i]);
+        const std::size_t align = fields[i].kind == FieldKind::FixedText || fields[i].kind == FieldKind::Bool8
+                                      ? 1
+                                  : fields[i].kind == FieldKind::Int32Array ? 4
+                                                                            : FieldSize(fields[i]);
         if (fields[i].offset % align != 0)
             return false;
         for (std::size_t j = 0; j < i; ++j)
