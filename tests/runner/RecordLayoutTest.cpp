@@ -16,8 +16,9 @@ using nlohmann::json;
 
 // Test layouts only: the services describe their own.
 constexpr RecordField kItemFields[] = {
-    {"id", 0, FieldKind::UInt64},       {"title", 8, FieldKind::TextPointer}, {"progress", 16, FieldKind::Float},
-    {"count", 20, FieldKind::UInt32},   {"owned", 24, FieldKind::Bool8},      {"level", 28, FieldKind::Int32},
+    {"id", 0, FieldKind::UInt64},          {"title", 8, FieldKind::TextPointer},
+    {"progress", 16, FieldKind::Float},    {"count", 20, FieldKind::UInt32},
+    {"owned", 24, FieldKind::Bool8},       {"level", 28, FieldKind::Int32},
     {"tag", 32, FieldKind::FixedText, 32},
 };
 static_assert(FieldsFit(kItemFields, 64));
@@ -43,7 +44,8 @@ static_assert(!FieldsFit(kPastTheEnd, 64) && !FieldsFit(kOverlapping, 64) && !Fi
 
 TEST(RecordLayout, NamedFieldsLandAtTheirOffsetsAndComeBack)
 {
-    const std::string text = R"({"id": "76561197960287930", "title": "Sword", "progress": 0.5, "count": 4000000000,
+    const std::string text =
+        R"({"id": "76561197960287930", "title": "Sword", "progress": 0.5, "count": 4000000000,
                                  "owned": true, "level": -3, "tag": "blue"})";
     ScenarioFile file(text, "t.json");
     auto record = EncodeRecord(kItem, json::parse(text), file, "");
@@ -69,7 +71,8 @@ TEST(RecordLayout, NamedFieldsLandAtTheirOffsetsAndComeBack)
 
     // Fields left out are zero: a null text, an empty fixed text, zero details.
     ScenarioFile scoreFile(R"({"score": 7, "userName": "Ann", "details": [1, 2]})", "t.json");
-    auto score = EncodeRecord(kScore, json{{"score", 7}, {"userName", "Ann"}, {"details", {1, 2}}}, scoreFile, "");
+    auto score =
+        EncodeRecord(kScore, json{{"score", 7}, {"userName", "Ann"}, {"details", {1, 2}}}, scoreFile, "");
     json back = DecodeRecord(kScore, score->Data());
     EXPECT_EQ(back["score"], 7);
     EXPECT_EQ(back["userName"], "Ann");
@@ -95,7 +98,8 @@ TEST(RecordLayout, RefusesUnknownFieldsAndValuesOutOfRangeAtTheirPlace)
          "t.json:2:11: titel: the item record has no field \"titel\"; its fields: id, title, progress"},
         {"int32 too big", &kItem, "{\"level\": 2147483648}", "level: the integer 2147483648 is out of range"},
         {"uint32 negative", &kItem, "{\"count\": -1}", "count: expected a non-negative integer"},
-        {"uint32 too big", &kItem, "{\"count\": 4294967296}", "count: the integer 4294967296 is out of range"},
+        {"uint32 too big", &kItem, "{\"count\": 4294967296}",
+         "count: the integer 4294967296 is out of range"},
         {"float too big", &kItem, "{\"progress\": 1e39}", "progress: the number 1e+39 is out of the range"},
         {"bool as number", &kItem, "{\"owned\": 1}", "owned: expected true or false"},
         {"fixed text without room for its end", &kItem, "{\"tag\": \"0123456789012345678901234567890123\"}",
@@ -120,7 +124,8 @@ TEST(RecordLayout, ExpectedRecordsCompareTheNamedFieldsAsTheModuleHoldsThem)
 {
     ScenarioFile file(R"({"progress": 0.1, "title": "Sword"})", "t.json");
     Expectations e;
-    e.result = json{{"record", CheckRecordPattern(kItem, json{{"progress", 0.1}, {"title", "Sword"}}, file, "")}};
+    e.result =
+        json{{"record", CheckRecordPattern(kItem, json{{"progress", 0.1}, {"title", "Sword"}}, file, "")}};
     RecordBuffer held(64);
     auto record = EncodeRecord(kItem, json{{"progress", 0.1}, {"title", "Sword"}, {"id", 9u}}, file, "");
     auto outcomes = Evaluate(e, CallResult{DecodeRecord(kItem, record->Data()), std::nullopt}, {});

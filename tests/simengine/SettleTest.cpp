@@ -37,10 +37,10 @@ void Waker(void* argument)
 {
     auto* flag = static_cast<Flag*>(argument);
     Host()->threads->ThreadSleep(100);
+    Host()->LogInfo("raising");
     Host()->threads->LockMutex(flag->mutex);
     flag->raised = 1;
     Host()->threads->UnlockMutex(flag->mutex);
-    Host()->LogInfo("raised");
     while (!Host()->IsQuitting())
         Host()->threads->ThreadSleep(1000);
 }
@@ -110,7 +110,7 @@ TEST_F(SettleTest, AThreadUnblockedByAnotherActsBeforeTheStepEnds)
         table->threads->StartThread("Test_Watcher", &Watcher, &flag, 0);
         EXPECT_EQ(Step("started"), std::vector<std::string>{});
         engine.Time().Advance(100);
-        EXPECT_EQ(Step("the waker wakes"), (std::vector<std::string>{"raised", "seen"}));
+        EXPECT_EQ(Step("the waker wakes"), (std::vector<std::string>{"raising", "seen"}));
         EXPECT_EQ(engine.Threads().RunningCount("Test_Watcher"), 0);
     }
 }
