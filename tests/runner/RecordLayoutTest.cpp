@@ -82,6 +82,21 @@ TEST(RecordLayout, NamedFieldsLandAtTheirOffsetsAndComeBack)
     EXPECT_EQ(DecodeRecord(kItem, RecordBuffer(64).Data())["title"], nullptr);
 }
 
+TEST(RecordLayout, AKeptRecordIsReadWhereItLives)
+{
+    // The module fills the record after the call; a later read must see that.
+    RecordBuffer held(64);
+    KeptRecords kept;
+    kept.Keep("item1", kItem, held.Data());
+    kept.Keep("none", kItem, nullptr);
+    EXPECT_EQ(kept.Read("item1")["level"], 0);
+    int32_t level = 12;
+    std::memcpy(static_cast<unsigned char*>(held.Data()) + 28, &level, 4);
+    EXPECT_EQ(kept.Read("item1")["level"], 12);
+    EXPECT_EQ(kept.Read("none"), nullptr);
+    EXPECT_EQ(kept.Read("never kept"), nullptr);
+}
+
 TEST(RecordLayout, RefusesUnknownFieldsAndValuesOutOfRangeAtTheirPlace)
 {
     std::string manyDetails = "{\"details\": [0";

@@ -159,4 +159,17 @@ json CheckRecordPattern(const RecordLayout& layout, const json& fields, const Sc
     return pattern;
 }
 
+void KeptRecords::Keep(const std::string& name, const RecordLayout& layout, const void* record)
+{
+    kept_[name] = Kept{&layout, record};
+}
+
+json KeptRecords::Read(const std::string& name) const
+{
+    auto found = kept_.find(name);
+    if (found == kept_.end() || found->second.record == nullptr)
+        return nullptr;
+    return DecodeRecord(*found->second.layout, found->second.record);
+}
+
 }  // namespace steamext::run

@@ -17,6 +17,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <list>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -130,5 +131,22 @@ std::shared_ptr<RecordBuffer> EncodeRecord(const RecordLayout& layout, const nlo
 // with each value as DecodeRecord would show it.
 nlohmann::json CheckRecordPattern(const RecordLayout& layout, const nlohmann::json& fields,
                                   const ScenarioFile& file, const std::string& pointer);
+
+// Records the module keeps, by the name a scenario gave them ("keep_as"):
+// each read decodes the record where it lives, so that a later step sees
+// what the module or its threads wrote since.
+class KeptRecords {
+public:
+    void Keep(const std::string& name, const RecordLayout& layout, const void* record);
+    // The record's fields, or null when the call gave null or nothing was kept.
+    nlohmann::json Read(const std::string& name) const;
+
+private:
+    struct Kept {
+        const RecordLayout* layout;
+        const void* record;
+    };
+    std::map<std::string, Kept> kept_;
+};
 
 }  // namespace steamext::run

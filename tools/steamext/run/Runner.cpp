@@ -154,7 +154,7 @@ private:
             result.value = result.record != nullptr ? DecodeRecord(*step.operation->layout, result.record)
                                                     : json(nullptr);
             if (!step.keepAs.empty())
-                kept_[step.keepAs] = result.record;
+                kept_.Keep(step.keepAs, *step.operation->layout, result.record);
         }
         std::string shown = ShowResult(result, step.operation->result);
         json detail = {{"action", "call"}, {"operation", step.operation->name}, {"args", step.argsShown}};
@@ -169,9 +169,8 @@ private:
     // A record kept by an earlier call, read again where the module keeps it.
     std::optional<CallResult> Read(const Step& step)
     {
-        const void* record = kept_[step.readName];
         CallResult result;
-        result.value = record != nullptr ? DecodeRecord(*step.readLayout, record) : json(nullptr);
+        result.value = kept_.Read(step.readName);
         timeline_.Step(Now(), step.index, "read " + step.readName + " -> " + Compact(result.value), step.note,
                        {{"action", "read"}, {"record", step.readName}, {"result", result.value}});
         return result;
@@ -295,7 +294,7 @@ private:
     std::thread::id mainThread_;
     std::map<std::thread::id, std::string> otherThreads_;
     std::vector<json> stepRecords_;
-    std::map<std::string, const void*> kept_;  // records kept by "keep_as", by name
+    KeptRecords kept_;
     RunSummary summary_;
 };
 

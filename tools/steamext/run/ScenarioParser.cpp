@@ -309,9 +309,9 @@ WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
 }
 
 // Records kept by earlier steps' calls ("keep_as"), by name.
-using KeptRecords = std::map<std::string, const RecordLayout*>;
+using RecordNames = std::map<std::string, const RecordLayout*>;
 
-Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t index, KeptRecords& kept)
+Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t index, RecordNames& kept)
 {
     const json& step = r.Object(value, at);
     r.OnlyKeys(step, at,
@@ -432,7 +432,7 @@ Scenario ParseScenario(const std::string& text, const std::string& displayName,
     if (!document.contains("steps"))
         r.Fail("", "a scenario needs \"steps\", the list of what to do");
     const json& steps = r.Array(document["steps"], "/steps");
-    KeptRecords kept;
+    RecordNames kept;
     for (std::size_t i = 0; i < steps.size(); ++i)
         scenario.steps.push_back(ParseStep(r, steps[i], R::Child("/steps", i), i + 1, kept));
     return scenario;
