@@ -2,6 +2,7 @@
 
 #include <cstdio>
 #include <cstring>
+#include <thread>
 #include <vector>
 
 #include "EventDecoding.h"
@@ -41,6 +42,34 @@ void Engine::QuitAndJoin()
 {
     SetQuitting(true);
     threads_.JoinAll();
+}
+
+Engine::SettleReport Engine::Settle(std::chrono::milliseconds guard)
+{
+    threads_.NewEngineTurn();
+    SettleReport report;
+    const auto deadline = std::chrono::steady_clock::now() + guard;
+    for (;;) {
+        ++report.probes;
+        const uint64_t progress = threads_.ProgressCount();
+        bool settled = true;
+        std::vector<std::string> polling;
+        for (const auto& name : threads_.RunningNames()) {
+            int polls = threads_.PollingCount(name);
+            if (polls > 0)
+                polling.push_back(name);
+            settled = settled && clock_.SleepingCount(name) + polls >= threads_.RunningCount(name);
+        }
+        if (settled && threads_.ProgressCount() == progress) {
+            report.settled = true;
+            report.polling = std::move(polling);
+            return report;
+        }
+        if (std::chrono::steady_clock::now() >= deadline)
+            return report;
+        // Not for correctness: only to leave the module's threads the cores.
+        std::this_thread::sleep_for(std::chrono::microseconds(100));
+    }
 }
 
 void Engine::SetQuitting(bool quitting)

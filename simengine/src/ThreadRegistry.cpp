@@ -1,5 +1,7 @@
 #include "simengine/ThreadRegistry.h"
 
+#include <algorithm>
+
 #include <pthread.h>
 
 #include "simengine/Journal.h"
@@ -9,6 +11,7 @@ namespace simengine {
 namespace {
 
 thread_local std::string currentThreadName = "main";
+thread_local void* currentTracked = nullptr;  // the calling thread's record, if the engine started it
 
 }  // namespace
 
@@ -33,11 +36,14 @@ void ThreadRegistry::Start(const char* name, HostThreadEntry entry, void* argume
     ++startedCounts_[threadName];
     // The thread is started under the lock so that a join never sees a
     // record whose std::thread is still being assigned.
-    self->thread = std::thread([self, entry, argument] {
+    self->thread = std::thread([this, self, entry, argument] {
         currentThreadName = self->name;
+        currentTracked = self;
         // The OS name helps in debuggers; it is cut to 15 characters there.
         pthread_setname_np(pthread_self(), self->name.substr(0, 15).c_str());
         entry(argument);
+        std::lock_guard<std::mutex> ended(mutex_);
+        ProgressLocked(self);
         self->finished.store(true);
     });
     threads_.push_back(std::move(tracked));
@@ -105,6 +111,87 @@ int ThreadRegistry::RunningCount(const std::string& name) const
     for (const auto& tracked : threads_)
         count += (!tracked->finished.load() && tracked->name == name) ? 1 : 0;
     return count;
+}
+
+void ThreadRegistry::NoteCall(const std::string& call)
+{
+    auto* self = static_cast<Tracked*>(currentTracked);
+    if (self == nullptr)
+        return;
+    std::lock_guard<std::mutex> lock(mutex_);
+    if (std::find(self->recent.begin(), self->recent.end(), call) == self->recent.end())
+        ProgressLocked(self);
+    self->recent.push_back(call);
+    if (self->recent.size() > kMaxPollCycle)
+        self->recent.erase(self->recent.begin());
+    self->sinceTurn.push_back(call);
+    if (self->sinceTurn.size() > 2 * kMaxPollCycle)
+        self->sinceTurn.erase(self->sinceTurn.begin());
+}
+
+void ThreadRegistry::NoteSleep()
+{
+    auto* self = static_cast<Tracked*>(currentTracked);
+    if (self == nullptr)
+        return;
+    std::lock_guard<std::mutex> lock(mutex_);
+    ProgressLocked(self);
+    self->recent.clear();
+    self->sinceTurn.clear();
+}
+
+uint64_t ThreadRegistry::ProgressCount() const
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    return progress_;
+}
+
+void ThreadRegistry::ProgressLocked(const Tracked* self)
+{
+    ++progress_;
+    for (auto& tracked : threads_)
+        if (tracked.get() != self)
+            tracked->sinceTurn.clear();
+}
+
+void ThreadRegistry::NewEngineTurn()
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    ProgressLocked(nullptr);
+}
+
+bool ThreadRegistry::Polls(const std::vector<std::string>& calls)
+{
+    const std::size_t n = calls.size();
+    for (std::size_t cycle = 1; cycle <= kMaxPollCycle && 2 * cycle <= n; ++cycle)
+        if (std::equal(calls.end() - static_cast<long>(cycle), calls.end(),
+                       calls.end() - static_cast<long>(2 * cycle)))
+            return true;
+    return false;
+}
+
+int ThreadRegistry::PollingCount(const std::string& name) const
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    int count = 0;
+    for (const auto& tracked : threads_)
+        count += (!tracked->finished.load() && tracked->name == name && Polls(tracked->sinceTurn)) ? 1 : 0;
+    return count;
+}
+
+std::vector<std::string> ThreadRegistry::RunningNames() const
+{
+    std::lock_guard<std::mutex> lock(mutex_);
+    std::vector<std::string> names;
+    for (const auto& tracked : threads_)
+        if (!tracked->finished.load() && std::find(names.begin(), names.end(), tracked->name) == names.end())
+            names.push_back(tracked->name);
+    return names;
+}
+
+bool ThreadRegistry::IsWatchedThread()
+{
+    return currentTracked != nullptr;
 }
 
 std::string ThreadRegistry::CurrentName()

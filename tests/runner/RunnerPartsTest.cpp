@@ -7,7 +7,8 @@
 #include "run/JsonLocator.h"
 #include "run/Records.h"
 #include "run/Scenario.h"
-#include "run/ScenarioReader.h"
+#include "run/ScenarioFile.h"
+#include "run/ScenarioParser.h"
 
 namespace steamext::run {
 namespace {
@@ -191,11 +192,16 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
          "steps[0].args.dat: \"cloud.WriteFile\" has no argument \"dat\""},
         {"{\"steps\": [{\"call\": \"GetName\", \"expect\": 3}]}",
          "steps[0].expect: expected a string, got an integer"},
-        {"{\"steps\": [{\"frames\": 1, \"expect\": true}]}", "needs \"call\" in the same step"},
+        {"{\"steps\": [{\"frames\": 1, \"expect\": true}]}", "needs \"call\" or \"read\" in the same step"},
         {"{\"steps\": [{\"wait_for\": {\"event\": 17, \"log\": \"x\"}}]}", "wait for exactly one thing"},
         {"{\"steps\": [{\"logs\": [{}]}]}", "steps[0].logs[0]: an empty pattern matches anything"},
         {"{\"steps\": [{\"inputs\": {\"keys\": \"1\"}}]}", "steps[0].inputs.keys: unknown key"},
         {"{\"steps\": [{}]}", "steps[0]: an empty step"},
+        {"{\"steps\": [{\"read\": \"item1\"}]}",
+         "steps[0].read: no earlier step keeps a record as \"item1\""},
+        {"{\"steps\": [{\"call\": \"GetName\", \"keep_as\": \"n\"}]}",
+         "steps[0].keep_as: \"GetName\" gives no record to keep"},
+        {"{\"steps\": [{\"frames\": 1, \"keep_as\": \"n\"}]}", "\"keep_as\" belongs to a \"call\""},
         {"{\"engine\": {\"clock\": \"fast\"}, \"steps\": []}", "engine.clock: the clock is"},
         {"{\"engine\": {\"clock\": \"manual\", \"time_scale\": 4}, \"steps\": []}",
          "only applies to the \"scaled\" clock"},

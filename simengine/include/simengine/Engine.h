@@ -19,6 +19,7 @@
 // each live in a header of their own; the engine wires them to the table.
 #pragma once
 
+#include <chrono>
 #include <cstdarg>
 #include <cstdint>
 #include <map>
@@ -26,6 +27,7 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <vector>
 
 #include "host/HostEvent.h"
 #include "host/HostServices.h"
@@ -55,6 +57,19 @@ public:
     void QuitAndJoin();
     void SetQuitting(bool quitting);
     bool IsQuitting() const;
+
+    // How a wait for the module's threads ended.
+    struct SettleReport {
+        bool settled = false;              // false: the guard ran out first
+        uint64_t probes = 0;               // looks at the threads it took
+        std::vector<std::string> polling;  // names of the threads found polling
+    };
+    // Manual clock: waits until every thread the engine started is asleep in
+    // ThreadSleep, has ended, or polls (see ThreadRegistry). The engine's
+    // thread is the caller, so a new engine turn starts first. Time may move
+    // only at such a point: no thread is then between two reads of the clock.
+    // `guard` (real time) only stops a hang, e.g. a thread that computes forever.
+    SettleReport Settle(std::chrono::milliseconds guard = std::chrono::seconds(5));
 
     // Configuration the module asks for.
     void SetProductValue(const std::string& key, std::optional<std::string> value);

@@ -3,6 +3,17 @@
 // The module never joins what it starts; its threads end when IsQuitting turns
 // true. The registry keeps every thread so the engine can join them all after
 // quitting, and tests can join the threads of one name (e.g. a results thread).
+//
+// It also tells which threads poll. A thread that calls the same things over
+// and over without sleeping waits for something only the engine's thread can
+// change (a name that arrives in the pump, a value the engine sets). The
+// engine notes every call of its table made by one of these threads; whoever
+// sees the platform's calls notes them too (NoteCall). A thread polls when,
+// since the engine's thread last acted (NewEngineTurn) and since any other
+// thread last made progress, its calls repeat one cycle of at most
+// kMaxPollCycle calls twice over: it has looked at the state the others left
+// and found nothing new. Progress is a call the thread had not made among its
+// last kMaxPollCycle calls, going to sleep, or ending.
 #pragma once
 
 #include <atomic>
@@ -38,6 +49,25 @@ public:
     int RunningCount() const;
     int RunningCount(const std::string& name) const;
 
+    static constexpr std::size_t kMaxPollCycle = 4;
+    // A call of the calling thread, by name and arguments ("GetProductValue(x)").
+    // Calls of threads the engine did not start are not watched.
+    void NoteCall(const std::string& call);
+    // The calling thread goes to sleep in ThreadSleep: progress, not a poll.
+    void NoteSleep();
+    // The engine's thread has acted: every thread must show its polling anew.
+    void NewEngineTurn();
+    // Moves on each progress of any thread: a look at the threads is
+    // consistent when it has not moved meanwhile.
+    uint64_t ProgressCount() const;
+    // Running threads of this name that poll.
+    int PollingCount(const std::string& name) const;
+    // Names of the threads still running, each once.
+    std::vector<std::string> RunningNames() const;
+
+    // True on a thread the engine started: the one whose calls are noted.
+    static bool IsWatchedThread();
+
     // Name of the calling thread: its StartThread name, or the name set here
     // ("main" for a thread the engine did not start).
     static std::string CurrentName();
@@ -48,7 +78,13 @@ private:
         std::string name;
         std::thread thread;
         std::atomic<bool> finished{false};
+        std::vector<std::string> recent;     // last calls, kept across turns
+        std::vector<std::string> sinceTurn;  // calls since the last turn or progress
     };
+
+    static bool Polls(const std::vector<std::string>& calls);
+    // Progress of `self`: the others must show their polling anew.
+    void ProgressLocked(const Tracked* self);
 
     void JoinMatching(const std::string* name);
 
@@ -56,6 +92,7 @@ private:
     mutable std::mutex mutex_;
     std::vector<std::unique_ptr<Tracked>> threads_;
     std::map<std::string, int> startedCounts_;
+    uint64_t progress_ = 0;
 };
 
 }  // namespace simengine

@@ -7,7 +7,7 @@ if(NOT clash EQUAL -1)
   message(FATAL_ERROR "${INPUT} holds the text )tour\" which ends the embedded string early")
 endif()
 file(WRITE ${OUTPUT} "// Generated from scenarios/tour.json at build time; edit that file instead.\n"
-  "#include \"run/Scenario.h\"\n\n"
+  "#include \"run/ScenarioParser.h\"\n\n"
   "namespace steamext::run {\n\n"
   "const char* const kBuiltinTour = R\"tour(${tour})tour\";\n\n"
   "}  // namespace steamext::run\n")

@@ -231,19 +231,16 @@ void EngineSession::Advance(uint32_t ms)
 void EngineSession::Settle()
 {
     // With the manual clock, time must not move while a thread of the module
-    // is between two sleeps: it would read the clock before or after the move
-    // depending on the scheduler. The module's threads poll with ThreadSleep,
-    // so each is soon asleep or finished. The bound only guards against hangs.
-    simengine::Engine& engine = state_->engine;
-    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(5);
-    for (;;) {
-        bool settled = true;
-        for (const auto& name : StartedNames())
-            settled = settled && engine.Time().SleepingCount(name) >= engine.Threads().RunningCount(name);
-        if (settled || std::chrono::steady_clock::now() >= deadline)
-            return;
-        std::this_thread::sleep_for(std::chrono::microseconds(200));
-    }
+    // is between two reads of it: it would see the clock before or after the
+    // move depending on the scheduler. The engine waits until every thread is
+    // asleep, ended, or polls for something only this thread can change.
+    lastSettle_ = state_->engine.Settle();
+}
+
+void EngineSession::NotePlatformCall(const std::string& name, const std::string& args)
+{
+    if (simengine::ThreadRegistry::IsWatchedThread())
+        simengine::Engine::Instance().Threads().NoteCall(name + "(" + args + ")");
 }
 
 std::vector<json> EngineSession::TakeRecords()

@@ -13,6 +13,8 @@
 
 #include <nlohmann/json.hpp>
 
+#include <simengine/Engine.h>
+
 #include "run/Scenario.h"
 
 class ExtensionModule;
@@ -39,9 +41,23 @@ public:
     void UnloadModule();
 
     uint32_t NowMs() const;
-    // The manual clock moves at once, between two points where every thread of
-    // the module is asleep; the scaled clock is waited for.
+    // The manual clock moves at once, between two points where the module's
+    // threads are settled; the scaled clock is waited for.
+    //
+    // Settled means: every thread the module started is asleep in ThreadSleep,
+    // has ended, or polls. A thread polls when, since this thread last acted
+    // and since any other thread last made progress, its calls (to the
+    // engine's table, and to the platform where the client reports them)
+    // repeat one cycle of at most four calls twice over, e.g. a results thread
+    // asking RequestUserInformation until the pump brings the name. Such a
+    // thread can change nothing until this thread acts, so the run stays
+    // deterministic. A real-time guard of 5 s only stops a hang; LastSettle
+    // tells whether it was needed.
     void Advance(uint32_t ms);
+    const simengine::Engine::SettleReport& LastSettle() const { return lastSettle_; }
+    // A platform call made on the calling thread, for telling polls from work;
+    // the simulated client's call observer feeds it.
+    static void NotePlatformCall(const std::string& name, const std::string& args);
 
     // What the module did to the engine since the last call, in order.
     std::vector<nlohmann::json> TakeRecords();
@@ -58,6 +74,7 @@ private:
 
     struct State;
     std::unique_ptr<State> state_;
+    simengine::Engine::SettleReport lastSettle_;
 };
 
 }  // namespace steamext::run

@@ -129,6 +129,16 @@ CallResult TextResult(const char* text)
                       std::nullopt};
 }
 
+const char* TextArg(const ArgValue& value)
+{
+    return value.text ? value.text->c_str() : nullptr;
+}
+
+CallResult RecordResult(const void* record)
+{
+    return CallResult{nullptr, std::nullopt, record};
+}
+
 const OperationTable& Operations()
 {
     static const OperationTable table = [] {

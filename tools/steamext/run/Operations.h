@@ -10,12 +10,15 @@
 #include <cstdint>
 #include <functional>
 #include <map>
+#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
 #include <nlohmann/json.hpp>
+
+#include "run/RecordLayout.h"
 
 class ExtensionModule;
 class BaseImplementation;
@@ -24,10 +27,11 @@ struct HostServices;
 namespace steamext::run {
 
 enum class ArgType {
-    Int,    // a JSON integer in the signed 32-bit range
-    Bool,   // true or false
-    Text,   // a string, or null for a null pointer
-    Bytes,  // a string (its UTF-8 bytes) or {"base64": "..."}
+    Int,     // a JSON integer in the signed 32-bit range
+    Bool,    // true or false
+    Text,    // a string, or null for a null pointer
+    Bytes,   // a string (its UTF-8 bytes) or {"base64": "..."}
+    Record,  // an object of named fields, built into a record by ArgSpec::layout
 };
 
 struct ArgSpec {
@@ -37,6 +41,7 @@ struct ArgSpec {
     std::optional<nlohmann::json> defaultValue = std::nullopt;
     // For Int: when left out, take the byte count of this Bytes argument instead.
     int sizeOfArg = -1;
+    const RecordLayout* layout = nullptr;  // Record
 };
 
 struct ArgValue {
@@ -44,6 +49,7 @@ struct ArgValue {
     bool flag = false;
     std::optional<std::string> text;  // Text: nullopt is a null pointer
     std::string bytes;
+    std::shared_ptr<RecordBuffer> record;  // Record: lives as long as the step
 };
 
 enum class ResultType {
@@ -53,13 +59,16 @@ enum class ResultType {
     Text,     // a text or null
     Buffer,   // a buffer of the engine's, or null
     Service,  // a service object, or null
+    Record,   // a record of Operation::layout that the module keeps, or null
 };
 
 // What a call gave: `value` for expectations and the JSON journal; `bytes`
-// holds a buffer's content.
+// holds a buffer's content; `record` the address of a record the module keeps
+// (the runner decodes it into `value`, and a later step may read it again).
 struct CallResult {
     nlohmann::json value;
     std::optional<std::string> bytes;
+    const void* record = nullptr;
 };
 
 // A call that could not be made, e.g. a service the module does not offer.
@@ -85,6 +94,7 @@ struct Operation {
     std::vector<ArgSpec> args;
     ResultType result = ResultType::None;
     Invoker invoke;
+    const RecordLayout* layout = nullptr;  // ResultType::Record
 };
 
 class OperationTable {
@@ -106,11 +116,28 @@ const OperationTable& Operations();
 // IsAvailable under "<service>.".
 void AddBaseOperations(OperationTable& table, const std::string& service, int32_t number);
 
+// The service `number` as its class; throws CallFailure when the module
+// offers none. The engine knows the class by the number; so does the runner.
+template <class T> T* ServiceAs(const CallTarget& target, int32_t number, const char* serviceName)
+{
+    return static_cast<T*>(target.Service(number, serviceName));
+}
+
+// A Text argument as the module takes it: null, or the text.
+const char* TextArg(const ArgValue& value);
+// A Record argument's bytes, to pass as a pointer to the service's struct.
+template <class T> T* RecordArg(const ArgValue& value)
+{
+    return static_cast<T*>(value.record->Data());
+}
+
 // Result helpers for the invokers.
 CallResult NoResult();
 CallResult BoolResult(bool value);
 CallResult IntResult(int32_t value);
 CallResult TextResult(const char* text);
+// The address of a record the module keeps, or null; the runner decodes it.
+CallResult RecordResult(const void* record);
 
 // One per file in operations/.
 void RegisterModuleOperations(OperationTable& table);

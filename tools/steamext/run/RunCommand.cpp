@@ -11,7 +11,7 @@
 #include "Subcommands.h"
 #include "run/EngineSession.h"
 #include "run/Runner.h"
-#include "run/Scenario.h"
+#include "run/ScenarioParser.h"
 #include "run/Timeline.h"
 
 namespace steamext::run {

@@ -15,10 +15,10 @@
 #include <simclient/World.h>
 
 #include "frame/ExtensionModule.h"
+#include "run/Base64.h"
 #include "run/EngineSession.h"
 #include "run/Expectations.h"
 #include "run/Records.h"
-#include "run/ScenarioReader.h"
 
 namespace steamext::run {
 
@@ -102,6 +102,9 @@ private:
         case StepKind::Wait:
             Wait(step);
             break;
+        case StepKind::Read:
+            result = Read(step);
+            break;
         case StepKind::World: {
             std::string what;
             for (const auto& edit : step.world)
@@ -147,6 +150,12 @@ private:
                                  "): could not call " + step.operation->name + ": " + failure.what());
             return std::nullopt;
         }
+        if (step.operation->result == ResultType::Record) {
+            result.value = result.record != nullptr ? DecodeRecord(*step.operation->layout, result.record)
+                                                    : json(nullptr);
+            if (!step.keepAs.empty())
+                kept_.Keep(step.keepAs, *step.operation->layout, result.record);
+        }
         std::string shown = ShowResult(result, step.operation->result);
         json detail = {{"action", "call"}, {"operation", step.operation->name}, {"args", step.argsShown}};
         if (step.operation->result != ResultType::None)
@@ -154,6 +163,16 @@ private:
                                                    {"bytes_base64", EncodeBase64(*result.bytes)}}
                                             : result.value;
         timeline_.Step(at, step.index, shown.empty() ? call : call + " -> " + shown, step.note, detail);
+        return result;
+    }
+
+    // A record kept by an earlier call, read again where the module keeps it.
+    std::optional<CallResult> Read(const Step& step)
+    {
+        CallResult result;
+        result.value = kept_.Read(step.readName);
+        timeline_.Step(Now(), step.index, "read " + step.readName + " -> " + Compact(result.value), step.note,
+                       {{"action", "read"}, {"record", step.readName}, {"result", result.value}});
         return result;
     }
 
@@ -275,6 +294,7 @@ private:
     std::thread::id mainThread_;
     std::map<std::thread::id, std::string> otherThreads_;
     std::vector<json> stepRecords_;
+    KeptRecords kept_;
     RunSummary summary_;
 };
 

@@ -73,7 +73,8 @@ enum class StepKind {
     Frames,
     Advance,
     Wait,
-    World
+    World,
+    Read,
 };
 
 struct Step {
@@ -85,6 +86,10 @@ struct Step {
     const Operation* operation = nullptr;  // Call
     std::vector<ArgValue> args;
     nlohmann::json argsShown;  // the arguments as written, for the timeline
+    std::string keepAs;        // Call of a record: the name a later "read" uses
+
+    std::string readName;                      // Read: a record kept by an earlier call
+    const RecordLayout* readLayout = nullptr;  // and its layout
 
     uint32_t frames = 0;     // Frames
     uint32_t advanceMs = 0;  // Advance
@@ -102,12 +107,5 @@ struct Scenario {
     EngineSetup engine;
     std::vector<Step> steps;
 };
-
-// Reads and checks a whole scenario. `baseDir` resolves a relative data root.
-Scenario ParseScenario(const std::string& text, const std::string& displayName,
-                       const std::filesystem::path& baseDir);
-
-// The built-in tour, the text of scenarios/tour.json at build time.
-extern const char* const kBuiltinTour;
 
 }  // namespace steamext::run

@@ -1,8 +1,10 @@
 // Reads a scenario file into the model of Scenario.h, checking every value.
-#include <algorithm>
+#include "run/ScenarioParser.h"
 
-#include "run/Scenario.h"
-#include "run/ScenarioReader.h"
+#include <algorithm>
+#include <map>
+
+#include "run/ScenarioFile.h"
 #include "run/WorldSetup.h"
 
 namespace steamext::run {
@@ -11,7 +13,7 @@ using nlohmann::json;
 
 namespace {
 
-using R = ScenarioReader;
+using R = ScenarioFile;
 
 EngineSetup ParseEngine(const R& r, const json& engine, const std::string& at)
 {
@@ -147,14 +149,25 @@ std::vector<ArgValue> ParseArgs(const R& r, const Operation& op, const json* giv
         case ArgType::Bytes:
             args[i].bytes = r.Bytes(*value, p);
             break;
+        case ArgType::Record:
+            args[i].record = EncodeRecord(*spec.layout, *value, r, p);
+            break;
         }
     }
     return args;
 }
 
+json ParseExpectedRecord(const R& r, const RecordLayout& layout, const json& value, const std::string& at)
+{
+    // Null, or some of the record's fields.
+    return value.is_null() ? json(nullptr) : json{{"record", CheckRecordPattern(layout, value, r, at)}};
+}
+
 json ParseExpectedResult(const R& r, const Operation& op, const json& value, const std::string& at)
 {
     switch (op.result) {
+    case ResultType::Record:
+        return ParseExpectedRecord(r, *op.layout, value, at);
     case ResultType::None:
         r.Fail(at, "\"" + op.name + "\" returns nothing, so there is no result to expect");
     case ResultType::Bool:
@@ -213,14 +226,16 @@ const std::vector<std::string> kLogKeys = {"level", "text", "text_contains", "so
 const std::vector<std::string> kCallKeys = {"name", "args", "args_contains", "thread"};
 const std::vector<std::string> kHostKeys = {"command", "argument", "argument_contains", "answer"};
 
-void ParseExpectations(const R& r, const json& step, const std::string& at, const Operation* op,
-                       Expectations& e)
+void ParseExpectations(const R& r, const json& step, const std::string& at, const Step& s, Expectations& e)
 {
     if (step.contains("expect")) {
-        if (op == nullptr)
+        if (s.kind == StepKind::Read)
+            e.result = ParseExpectedRecord(r, *s.readLayout, step["expect"], R::Child(at, "expect"));
+        else if (s.operation == nullptr)
             r.Fail(R::Child(at, "expect"),
-                   "\"expect\" checks a call's result and needs \"call\" in the same step");
-        e.result = ParseExpectedResult(r, *op, step["expect"], R::Child(at, "expect"));
+                   "\"expect\" checks a call's result and needs \"call\" or \"read\" in the same step");
+        else
+            e.result = ParseExpectedResult(r, *s.operation, step["expect"], R::Child(at, "expect"));
     }
     if (step.contains("events")) {
         const std::string p = R::Child(at, "events");
@@ -293,13 +308,16 @@ WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
     return wait;
 }
 
-Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t index)
+// Records kept by earlier steps' calls ("keep_as"), by name.
+using RecordNames = std::map<std::string, const RecordLayout*>;
+
+Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t index, RecordNames& kept)
 {
     const json& step = r.Object(value, at);
     r.OnlyKeys(step, at,
-               {"note", "call", "args", "frames", "advance_ms", "wait_for", "timeout_ms", "world", "expect",
-                "events", "logs", "no_logs", "platform_calls", "no_platform_calls", "host_commands",
-                "inputs"});
+               {"note", "call", "args", "frames", "advance_ms", "wait_for", "timeout_ms", "world", "keep_as",
+                "read", "expect", "events", "logs", "no_logs", "platform_calls", "no_platform_calls",
+                "host_commands", "inputs"});
     Step s;
     s.index = index;
     s.place = r.Place(at);
@@ -307,11 +325,13 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
         s.note = r.String(step["note"], R::Child(at, "note"));
 
     int actions = 0;
-    for (const char* key : {"call", "frames", "advance_ms", "wait_for", "world"})
+    for (const char* key : {"call", "frames", "advance_ms", "wait_for", "world", "read"})
         actions += step.contains(key) ? 1 : 0;
     if (actions > 1)
-        r.Fail(at,
-               "a step does one thing: one of \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\"");
+        r.Fail(at, "a step does one thing: one of \"call\", \"frames\", \"advance_ms\", \"wait_for\", "
+                   "\"world\", \"read\"");
+    if (step.contains("keep_as") && !step.contains("call"))
+        r.Fail(R::Child(at, "keep_as"), "\"keep_as\" belongs to a \"call\"");
     if (step.contains("args") && !step.contains("call"))
         r.Fail(R::Child(at, "args"), "\"args\" belongs to a \"call\"");
     if (step.contains("timeout_ms") && !step.contains("wait_for"))
@@ -335,6 +355,15 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
         const json* args = step.contains("args") ? &step["args"] : nullptr;
         s.args = ParseArgs(r, *s.operation, args, R::Child(at, "args"));
         s.argsShown = args != nullptr ? *args : json::array();
+        if (step.contains("keep_as")) {
+            const std::string p = R::Child(at, "keep_as");
+            s.keepAs = r.String(step["keep_as"], p);
+            if (s.operation->result != ResultType::Record)
+                r.Fail(p, "\"" + name + "\" gives no record to keep");
+            if (s.keepAs.empty())
+                r.Fail(p, "the name to keep the record as is empty");
+            kept[s.keepAs] = s.operation->layout;
+        }
     } else if (step.contains("frames")) {
         s.kind = StepKind::Frames;
         s.frames = static_cast<uint32_t>(r.Int(step["frames"], R::Child(at, "frames"), 1, 1000000));
@@ -350,8 +379,16 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
     } else if (step.contains("world")) {
         s.kind = StepKind::World;
         s.world = ParseWorld(r, step["world"], R::Child(at, "world"));
+    } else if (step.contains("read")) {
+        s.kind = StepKind::Read;
+        const std::string p = R::Child(at, "read");
+        s.readName = r.String(step["read"], p);
+        auto found = kept.find(s.readName);
+        if (found == kept.end())
+            r.Fail(p, "no earlier step keeps a record as \"" + s.readName + "\" (\"keep_as\" on its call)");
+        s.readLayout = found->second;
     }
-    ParseExpectations(r, step, at, s.operation, s.expect);
+    ParseExpectations(r, step, at, s, s.expect);
     if (s.kind == StepKind::Note && s.note.empty() && step.size() == 0)
         r.Fail(at, "an empty step; give it \"call\", \"frames\", \"advance_ms\", \"wait_for\", \"world\" or "
                    "\"note\"");
@@ -395,8 +432,9 @@ Scenario ParseScenario(const std::string& text, const std::string& displayName,
     if (!document.contains("steps"))
         r.Fail("", "a scenario needs \"steps\", the list of what to do");
     const json& steps = r.Array(document["steps"], "/steps");
+    RecordNames kept;
     for (std::size_t i = 0; i < steps.size(); ++i)
-        scenario.steps.push_back(ParseStep(r, steps[i], R::Child("/steps", i), i + 1));
+        scenario.steps.push_back(ParseStep(r, steps[i], R::Child("/steps", i), i + 1, kept));
     return scenario;
 }
 

@@ -46,12 +46,12 @@ std::string Shown(const json& value)
     return value.dump(-1, ' ', false, json::error_handler_t::replace);
 }
 
-WorldEdit ParseInterfaces(const ScenarioReader& r, const json& value, const std::string& pointer)
+WorldEdit ParseInterfaces(const ScenarioFile& r, const json& value, const std::string& pointer)
 {
     r.Object(value, pointer);
     std::vector<std::pair<simclient::Interface, bool>> changes;
     for (const auto& item : value.items()) {
-        const std::string at = ScenarioReader::Child(pointer, item.key());
+        const std::string at = ScenarioFile::Child(pointer, item.key());
         const InterfaceName* found = nullptr;
         for (const auto& candidate : kInterfaces)
             found = item.key() == candidate.key ? &candidate : found;
@@ -69,23 +69,22 @@ WorldEdit ParseInterfaces(const ScenarioReader& r, const json& value, const std:
             }};
 }
 
-WorldEdit ParseUser(const ScenarioReader& r, const json& value, const std::string& pointer)
+WorldEdit ParseUser(const ScenarioFile& r, const json& value, const std::string& pointer)
 {
     r.Object(value, pointer);
     r.OnlyKeys(value, pointer, {"steam_id", "logged_on", "name"});
     if (!value.contains("steam_id"))
         r.Fail(pointer, "a user needs \"steam_id\"");
-    uint64 id = r.UInt64(value["steam_id"], ScenarioReader::Child(pointer, "steam_id"));
+    uint64 id = r.UInt64(value["steam_id"], ScenarioFile::Child(pointer, "steam_id"));
     bool loggedOn = value.contains("logged_on")
-                        ? r.Bool(value["logged_on"], ScenarioReader::Child(pointer, "logged_on"))
+                        ? r.Bool(value["logged_on"], ScenarioFile::Child(pointer, "logged_on"))
                         : true;
-    std::string name = value.contains("name")
-                           ? r.String(value["name"], ScenarioReader::Child(pointer, "name"))
-                           : std::string("Player");
+    std::string name = value.contains("name") ? r.String(value["name"], ScenarioFile::Child(pointer, "name"))
+                                              : std::string("Player");
     return {"user " + Shown(value), [id, loggedOn, name](World& w) { w.SetLocalUser(id, loggedOn, name); }};
 }
 
-WorldEdit ParseStatsResult(const ScenarioReader& r, const json& value, const std::string& pointer,
+WorldEdit ParseStatsResult(const ScenarioFile& r, const json& value, const std::string& pointer,
                            bool received)
 {
     // A result code, or {"result": code, "game_id": id} to answer for another game.
@@ -95,9 +94,9 @@ WorldEdit ParseStatsResult(const ScenarioReader& r, const json& value, const std
         r.OnlyKeys(value, pointer, {"result", "game_id"});
         if (!value.contains("result"))
             r.Fail(pointer, "needs \"result\", the platform's result code (1 is OK)");
-        result = r.Int(value["result"], ScenarioReader::Child(pointer, "result"), 0, 200);
+        result = r.Int(value["result"], ScenarioFile::Child(pointer, "result"), 0, 200);
         if (value.contains("game_id"))
-            gameId = r.UInt64(value["game_id"], ScenarioReader::Child(pointer, "game_id"));
+            gameId = r.UInt64(value["game_id"], ScenarioFile::Child(pointer, "game_id"));
     } else {
         result = r.Int(value, pointer, 0, 200);
     }
@@ -110,18 +109,18 @@ WorldEdit ParseStatsResult(const ScenarioReader& r, const json& value, const std
             }};
 }
 
-WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::string& pointer)
+WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::string& pointer)
 {
     r.Array(value, pointer);
     std::vector<std::pair<std::string, simclient::Fault>> faults;
     for (std::size_t i = 0; i < value.size(); ++i) {
-        const std::string at = ScenarioReader::Child(pointer, i);
+        const std::string at = ScenarioFile::Child(pointer, i);
         const json& entry = r.Object(value[i], at);
         r.OnlyKeys(entry, at, {"call", "kind", "value", "skip", "times"});
         if (!entry.contains("call") || !entry.contains("kind"))
             r.Fail(at, "a fault needs \"call\" (the platform call's name) and \"kind\"");
-        std::string call = r.String(entry["call"], ScenarioReader::Child(at, "call"));
-        std::string kindName = r.String(entry["kind"], ScenarioReader::Child(at, "kind"));
+        std::string call = r.String(entry["call"], ScenarioFile::Child(at, "call"));
+        std::string kindName = r.String(entry["kind"], ScenarioFile::Child(at, "kind"));
         const FaultKind* kind = nullptr;
         for (const auto& candidate : kFaultKinds)
             kind = kindName == candidate.key ? &candidate : kind;
@@ -129,7 +128,7 @@ WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::str
             std::string list;
             for (const auto& candidate : kFaultKinds)
                 list += std::string(list.empty() ? "" : ", ") + candidate.key;
-            r.Fail(ScenarioReader::Child(at, "kind"),
+            r.Fail(ScenarioFile::Child(at, "kind"),
                    "unknown fault kind \"" + kindName + "\"; expected one of: " + list);
         }
         simclient::Fault fault;
@@ -137,14 +136,14 @@ WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::str
         if (kind->takesValue) {
             if (!entry.contains("value"))
                 r.Fail(at, "the fault \"" + kindName + "\" needs \"value\"");
-            fault.value = r.Int(entry["value"], ScenarioReader::Child(at, "value"));
+            fault.value = r.Int(entry["value"], ScenarioFile::Child(at, "value"));
         } else if (entry.contains("value")) {
-            r.Fail(ScenarioReader::Child(at, "value"), "the fault \"" + kindName + "\" takes no value");
+            r.Fail(ScenarioFile::Child(at, "value"), "the fault \"" + kindName + "\" takes no value");
         }
         if (entry.contains("skip"))
-            fault.skip = r.Int(entry["skip"], ScenarioReader::Child(at, "skip"), 0);
+            fault.skip = r.Int(entry["skip"], ScenarioFile::Child(at, "skip"), 0);
         if (entry.contains("times"))
-            fault.times = r.Int(entry["times"], ScenarioReader::Child(at, "times"), 0);
+            fault.times = r.Int(entry["times"], ScenarioFile::Child(at, "times"), 0);
         faults.emplace_back(call, fault);
     }
     return {"faults " + Shown(value), [faults](World& w) {
@@ -153,12 +152,12 @@ WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::str
             }};
 }
 
-WorldEdit ParseCloudFiles(const ScenarioReader& r, const json& value, const std::string& pointer)
+WorldEdit ParseCloudFiles(const ScenarioFile& r, const json& value, const std::string& pointer)
 {
     r.Object(value, pointer);
     std::vector<std::pair<std::string, std::vector<uint8>>> files;
     for (const auto& item : value.items()) {
-        std::string bytes = r.Bytes(item.value(), ScenarioReader::Child(pointer, item.key()));
+        std::string bytes = r.Bytes(item.value(), ScenarioFile::Child(pointer, item.key()));
         files.emplace_back(item.key(), std::vector<uint8>(bytes.begin(), bytes.end()));
     }
     std::string names;
@@ -172,7 +171,7 @@ WorldEdit ParseCloudFiles(const ScenarioReader& r, const json& value, const std:
 
 }  // namespace
 
-std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, const std::string& pointer)
+std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, const std::string& pointer)
 {
     r.Object(world, pointer);
     static const std::vector<std::string> kKeys = {"steam_running",
@@ -202,7 +201,7 @@ std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, co
         if (!world.contains(key))
             continue;
         const json& value = world[key];
-        const std::string at = ScenarioReader::Child(pointer, key);
+        const std::string at = ScenarioFile::Child(pointer, key);
         const std::string shown = key + " = " + Shown(value);
         if (key == "steam_running") {
             bool on = r.Bool(value, at);
@@ -223,7 +222,7 @@ std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, co
         } else if (key == "server_time") {
             if (!value.is_number_unsigned() || value.get<uint64_t>() > UINT32_MAX)
                 r.Fail(at, "expected seconds since 1970 as an unsigned 32-bit integer, got " +
-                               ScenarioReader::Describe(value));
+                               ScenarioFile::Describe(value));
             uint32 seconds = value.get<uint32>();
             edits.push_back({shown, [seconds](World& w) { w.SetServerTime(seconds); }});
         } else if (key == "language" || key == "branch") {
@@ -242,7 +241,7 @@ std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, co
             r.Object(value, at);
             std::vector<std::pair<std::string, int32>> stats;
             for (const auto& stat : value.items())
-                stats.emplace_back(stat.key(), r.Int(stat.value(), ScenarioReader::Child(at, stat.key())));
+                stats.emplace_back(stat.key(), r.Int(stat.value(), ScenarioFile::Child(at, stat.key())));
             edits.push_back({shown, [stats](World& w) {
                                  for (const auto& stat : stats)
                                      w.DefineStat(stat.first, stat.second);
@@ -251,7 +250,7 @@ std::vector<WorldEdit> ParseWorld(const ScenarioReader& r, const json& world, co
             r.Object(value, at);
             std::vector<std::pair<std::string, bool>> achievements;
             for (const auto& a : value.items())
-                achievements.emplace_back(a.key(), r.Bool(a.value(), ScenarioReader::Child(at, a.key())));
+                achievements.emplace_back(a.key(), r.Bool(a.value(), ScenarioFile::Child(at, a.key())));
             edits.push_back({shown, [achievements](World& w) {
                                  for (const auto& a : achievements)
                                      w.DefineAchievement(a.first, a.second);

@@ -8,11 +8,11 @@
 #include <nlohmann/json.hpp>
 
 #include "run/Scenario.h"
-#include "run/ScenarioReader.h"
+#include "run/ScenarioFile.h"
 
 namespace steamext::run {
 
-std::vector<WorldEdit> ParseWorld(const ScenarioReader& reader, const nlohmann::json& world,
+std::vector<WorldEdit> ParseWorld(const ScenarioFile& reader, const nlohmann::json& world,
                                   const std::string& pointer);
 
 }  // namespace steamext::run

@@ -8,13 +8,7 @@ namespace {
 
 AchievementImplementation* Achievements(const CallTarget& target)
 {
-    // The engine knows the class by the service number; so does the runner.
-    return static_cast<AchievementImplementation*>(target.Service(kServiceAchievements, "achievements"));
-}
-
-const char* Text(const ArgValue& value)
-{
-    return value.text ? value.text->c_str() : nullptr;
+    return ServiceAs<AchievementImplementation>(target, kServiceAchievements, "achievements");
 }
 
 }  // namespace
@@ -27,7 +21,7 @@ void RegisterAchievementOperations(OperationTable& table)
                {{"reserved", ArgType::Int, nlohmann::json(0)}, {"name", ArgType::Text}},
                ResultType::None,
                [](const CallTarget& t, const Args& a) {
-                   Achievements(t)->UnlockAchievement(a[0].number, Text(a[1]));
+                   Achievements(t)->UnlockAchievement(a[0].number, TextArg(a[1]));
                    return NoResult();
                }});
     table.Add({"achievements.ReservedAction1", {}, ResultType::None, [](const CallTarget& t, const Args&) {
@@ -45,14 +39,14 @@ void RegisterAchievementOperations(OperationTable& table)
                {{"name", ArgType::Text}, {"value", ArgType::Int}},
                ResultType::None,
                [](const CallTarget& t, const Args& a) {
-                   Achievements(t)->SetStatistic(Text(a[0]), a[1].number);
+                   Achievements(t)->SetStatistic(TextArg(a[0]), a[1].number);
                    return NoResult();
                }});
     table.Add({"achievements.GetStatistic",
                {{"name", ArgType::Text}},
                ResultType::Int,
                [](const CallTarget& t, const Args& a) {
-                   return IntResult(Achievements(t)->GetStatistic(Text(a[0])));
+                   return IntResult(Achievements(t)->GetStatistic(TextArg(a[0])));
                }});
 }
 

@@ -9,12 +9,7 @@ namespace {
 
 CloudImplementation* Cloud(const CallTarget& target)
 {
-    return static_cast<CloudImplementation*>(target.Service(kServiceCloud, "cloud"));
-}
-
-const char* Text(const ArgValue& value)
-{
-    return value.text ? value.text->c_str() : nullptr;
+    return ServiceAs<CloudImplementation>(target, kServiceCloud, "cloud");
 }
 
 }  // namespace
@@ -28,13 +23,13 @@ void RegisterCloudOperations(OperationTable& table)
                {{"name", ArgType::Text}, {"data", ArgType::Bytes}, {"size", ArgType::Int, std::nullopt, 1}},
                ResultType::Bool,
                [](const CallTarget& t, const Args& a) {
-                   return BoolResult(Cloud(t)->WriteFile(Text(a[0]), a[1].bytes.data(), a[2].number));
+                   return BoolResult(Cloud(t)->WriteFile(TextArg(a[0]), a[1].bytes.data(), a[2].number));
                }});
     table.Add({"cloud.ReadFile",
                {{"name", ArgType::Text}},
                ResultType::Buffer,
                [](const CallTarget& t, const Args& a) {
-                   HostBuffer* buffer = Cloud(t)->ReadFile(Text(a[0]));
+                   HostBuffer* buffer = Cloud(t)->ReadFile(TextArg(a[0]));
                    if (buffer == nullptr)
                        return CallResult{nullptr, std::nullopt};
                    std::string bytes(static_cast<const char*>(buffer->data), buffer->size);
@@ -46,7 +41,7 @@ void RegisterCloudOperations(OperationTable& table)
         {"cloud.DeleteFile",
          {{"name", ArgType::Text}},
          ResultType::Bool,
-         [](const CallTarget& t, const Args& a) { return BoolResult(Cloud(t)->DeleteFile(Text(a[0]))); }});
+         [](const CallTarget& t, const Args& a) { return BoolResult(Cloud(t)->DeleteFile(TextArg(a[0]))); }});
 }
 
 }  // namespace steamext::run

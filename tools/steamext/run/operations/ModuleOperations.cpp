@@ -35,9 +35,7 @@ void RegisterModuleOperations(OperationTable& table)
                {{"name", ArgType::Text}, {"argument", ArgType::Text, nlohmann::json(nullptr)}},
                ResultType::Text,
                [](const CallTarget& t, const Args& a) {
-                   const char* name = a[0].text ? a[0].text->c_str() : nullptr;
-                   const char* argument = a[1].text ? a[1].text->c_str() : nullptr;
-                   return TextResult(t.module->Command(name, argument));
+                   return TextResult(t.module->Command(TextArg(a[0]), TextArg(a[1])));
                }});
     table.Add({"GetImplementation",
                {{"number", ArgType::Int}},

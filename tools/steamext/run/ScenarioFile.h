@@ -1,5 +1,7 @@
-// Typed access to a scenario's JSON that names the place of every mistake:
-// "tour.json:12:7: steps[3].args[0]: expected an integer, got a string".
+// A scenario file's text, with typed access to its JSON values that names the
+// place of every mistake: "tour.json:12:7: steps[3].args[0]: expected an
+// integer, got a string". ScenarioParser turns the checked values into a
+// Scenario; JsonLocator finds a value's line and column in the text.
 #pragma once
 
 #include <cstdint>
@@ -9,13 +11,14 @@
 
 #include <nlohmann/json.hpp>
 
+#include "run/Base64.h"
 #include "run/JsonLocator.h"
 
 namespace steamext::run {
 
-class ScenarioReader {
+class ScenarioFile {
 public:
-    ScenarioReader(const std::string& text, std::string displayName);
+    ScenarioFile(const std::string& text, std::string displayName);
 
     // "file:line:column: path" of the value at `pointer`.
     std::string Place(const std::string& pointer) const;
@@ -47,8 +50,5 @@ private:
     std::string displayName_;
     JsonLocator locator_;
 };
-
-std::string DecodeBase64(const std::string& text, bool& ok);
-std::string EncodeBase64(const std::string& bytes);
 
 }  // namespace steamext::run

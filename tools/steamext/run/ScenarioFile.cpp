@@ -1,7 +1,6 @@
-#include "run/ScenarioReader.h"
+#include "run/ScenarioFile.h"
 
 #include <cmath>
-#include <cstring>
 #include <sstream>
 
 #include "run/Scenario.h"
@@ -10,12 +9,12 @@ namespace steamext::run {
 
 using nlohmann::json;
 
-ScenarioReader::ScenarioReader(const std::string& text, std::string displayName)
+ScenarioFile::ScenarioFile(const std::string& text, std::string displayName)
     : text_(text), displayName_(std::move(displayName)), locator_(text_)
 {
 }
 
-std::string ScenarioReader::Place(const std::string& pointer) const
+std::string ScenarioFile::Place(const std::string& pointer) const
 {
     TextPosition position = locator_.Find(pointer);
     std::ostringstream out;
@@ -26,12 +25,12 @@ std::string ScenarioReader::Place(const std::string& pointer) const
     return out.str();
 }
 
-void ScenarioReader::Fail(const std::string& pointer, const std::string& message) const
+void ScenarioFile::Fail(const std::string& pointer, const std::string& message) const
 {
     throw ScenarioError(Place(pointer) + ": " + message);
 }
 
-std::string ScenarioReader::Describe(const json& value)
+std::string ScenarioFile::Describe(const json& value)
 {
     std::string shown = value.dump(-1, ' ', false, json::error_handler_t::replace);
     if (shown.size() > 40)
@@ -57,7 +56,7 @@ std::string ScenarioReader::Describe(const json& value)
     }
 }
 
-int32_t ScenarioReader::Int(const json& value, const std::string& pointer, int64_t low, int64_t high) const
+int32_t ScenarioFile::Int(const json& value, const std::string& pointer, int64_t low, int64_t high) const
 {
     if (!value.is_number_integer())
         Fail(pointer, "expected an integer, got " + Describe(value));
@@ -72,7 +71,7 @@ int32_t ScenarioReader::Int(const json& value, const std::string& pointer, int64
     return static_cast<int32_t>(number);
 }
 
-uint64_t ScenarioReader::UInt64(const json& value, const std::string& pointer) const
+uint64_t ScenarioFile::UInt64(const json& value, const std::string& pointer) const
 {
     if (value.is_number_unsigned())
         return value.get<uint64_t>();
@@ -92,28 +91,28 @@ uint64_t ScenarioReader::UInt64(const json& value, const std::string& pointer) c
     Fail(pointer, "expected a 64-bit id (an integer or decimal text), got " + Describe(value));
 }
 
-double ScenarioReader::Number(const json& value, const std::string& pointer) const
+double ScenarioFile::Number(const json& value, const std::string& pointer) const
 {
     if (!value.is_number() || !std::isfinite(value.get<double>()))
         Fail(pointer, "expected a number, got " + Describe(value));
     return value.get<double>();
 }
 
-bool ScenarioReader::Bool(const json& value, const std::string& pointer) const
+bool ScenarioFile::Bool(const json& value, const std::string& pointer) const
 {
     if (!value.is_boolean())
         Fail(pointer, "expected true or false, got " + Describe(value));
     return value.get<bool>();
 }
 
-std::string ScenarioReader::String(const json& value, const std::string& pointer) const
+std::string ScenarioFile::String(const json& value, const std::string& pointer) const
 {
     if (!value.is_string())
         Fail(pointer, "expected a string, got " + Describe(value));
     return value.get<std::string>();
 }
 
-std::optional<std::string> ScenarioReader::StringOrNull(const json& value, const std::string& pointer) const
+std::optional<std::string> ScenarioFile::StringOrNull(const json& value, const std::string& pointer) const
 {
     if (value.is_null())
         return std::nullopt;
@@ -122,7 +121,7 @@ std::optional<std::string> ScenarioReader::StringOrNull(const json& value, const
     return value.get<std::string>();
 }
 
-std::string ScenarioReader::Bytes(const json& value, const std::string& pointer) const
+std::string ScenarioFile::Bytes(const json& value, const std::string& pointer) const
 {
     if (value.is_string())
         return value.get<std::string>();
@@ -137,22 +136,22 @@ std::string ScenarioReader::Bytes(const json& value, const std::string& pointer)
     Fail(pointer, "expected bytes: a string, or {\"base64\": \"...\"}; got " + Describe(value));
 }
 
-const json& ScenarioReader::Object(const json& value, const std::string& pointer) const
+const json& ScenarioFile::Object(const json& value, const std::string& pointer) const
 {
     if (!value.is_object())
         Fail(pointer, "expected an object {...}, got " + Describe(value));
     return value;
 }
 
-const json& ScenarioReader::Array(const json& value, const std::string& pointer) const
+const json& ScenarioFile::Array(const json& value, const std::string& pointer) const
 {
     if (!value.is_array())
         Fail(pointer, "expected a list [...], got " + Describe(value));
     return value;
 }
 
-void ScenarioReader::OnlyKeys(const json& object, const std::string& pointer,
-                              const std::vector<std::string>& allowed) const
+void ScenarioFile::OnlyKeys(const json& object, const std::string& pointer,
+                            const std::vector<std::string>& allowed) const
 {
     for (const auto& item : object.items()) {
         bool known = false;
@@ -167,7 +166,7 @@ void ScenarioReader::OnlyKeys(const json& object, const std::string& pointer,
     }
 }
 
-std::string ScenarioReader::Child(const std::string& pointer, const std::string& key)
+std::string ScenarioFile::Child(const std::string& pointer, const std::string& key)
 {
     std::string escaped;
     for (char c : key)
@@ -175,65 +174,9 @@ std::string ScenarioReader::Child(const std::string& pointer, const std::string&
     return pointer + "/" + escaped;
 }
 
-std::string ScenarioReader::Child(const std::string& pointer, std::size_t index)
+std::string ScenarioFile::Child(const std::string& pointer, std::size_t index)
 {
     return pointer + "/" + std::to_string(index);
-}
-
-namespace {
-const char kBase64Alphabet[] = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
-}
-
-std::string DecodeBase64(const std::string& text, bool& ok)
-{
-    std::string out;
-    uint32_t accumulator = 0;
-    int bits = 0;
-    std::size_t padding = 0;
-    ok = false;
-    for (char c : text) {
-        if (c == '=') {
-            ++padding;
-            continue;
-        }
-        if (padding > 0)
-            return {};  // data after padding
-        const char* found = std::strchr(kBase64Alphabet, c);
-        if (c == '\0' || found == nullptr)
-            return {};
-        accumulator = (accumulator << 6) | static_cast<uint32_t>(found - kBase64Alphabet);
-        bits += 6;
-        if (bits >= 8) {
-            bits -= 8;
-            out += static_cast<char>((accumulator >> bits) & 0xFF);
-        }
-    }
-    ok = padding <= 2 && (text.size() % 4 == 0 || padding == 0) && bits < 6;
-    return ok ? out : std::string();
-}
-
-std::string EncodeBase64(const std::string& bytes)
-{
-    std::string out;
-    std::size_t i = 0;
-    for (; i + 2 < bytes.size(); i += 3) {
-        uint32_t n = (uint8_t(bytes[i]) << 16) | (uint8_t(bytes[i + 1]) << 8) | uint8_t(bytes[i + 2]);
-        for (int shift = 18; shift >= 0; shift -= 6)
-            out += kBase64Alphabet[(n >> shift) & 63];
-    }
-    if (i + 1 == bytes.size()) {
-        uint32_t n = uint8_t(bytes[i]) << 16;
-        out += kBase64Alphabet[(n >> 18) & 63];
-        out += kBase64Alphabet[(n >> 12) & 63];
-        out += "==";
-    } else if (i + 2 == bytes.size()) {
-        uint32_t n = (uint8_t(bytes[i]) << 16) | (uint8_t(bytes[i + 1]) << 8);
-        out += kBase64Alphabet[(n >> 18) & 63];
-        out += kBase64Alphabet[(n >> 12) & 63];
-        out += kBase64Alphabet[(n >> 6) & 63];
-        out += '=';
-    }
-    return out;
 }
 
 }  // namespace steamext::run
