@@ -121,6 +121,9 @@ WorldEdit ParseFaults(const ScenarioReader& r, const json& value, const std::str
         if (!entry.contains("call") || !entry.contains("kind"))
             r.Fail(at, "a fault needs \"call\" (the platform call's name) and \"kind\"");
         std::string call = r.String(entry["call"], ScenarioReader::Child(at, "call"));
+        if (simclient::CallIndex(call) < 0)
+            r.Fail(ScenarioReader::Child(at, "call"),
+                   "unknown platform call \"" + call + "\"; known calls: " + simclient::KnownCallList());
         std::string kindName = r.String(entry["kind"], ScenarioReader::Child(at, "kind"));
         const FaultKind* kind = nullptr;
         for (const auto& candidate : kFaultKinds)
