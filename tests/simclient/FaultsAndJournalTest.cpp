@@ -1,5 +1,7 @@
 // Fault injection reaches every kind of failure path; the journal records calls in order.
 #include <cstring>
+#include <stdexcept>
+#include <thread>
 
 #include "SimFixture.h"
 
@@ -102,6 +104,48 @@ TEST_F(FaultsAndJournal, ResetKeepsRegistrationsOnly)
     world.SetOverlayActive(true);
     SteamAPI_RunCallbacks();
     EXPECT_EQ(c.calls, 1);
+}
+
+TEST_F(FaultsAndJournal, UnknownCallNamesAreRefusedWithTheKnownOnes)
+{
+    try {
+        world.InjectFault("FileReed", Fault::Fail());
+        ADD_FAILURE() << "accepted a call the client does not have";
+    } catch (const std::invalid_argument& e) {
+        const std::string message = e.what();
+        EXPECT_NE(message.find("\"FileReed\""), std::string::npos) << message;
+        EXPECT_NE(message.find("FileDelete, FileExists, FileRead, FileWrite"), std::string::npos) << message;
+    }
+    for (std::string_view name : simclient::kCallNames)
+        EXPECT_NO_THROW(world.InjectFault(std::string(name), Fault::Fail())) << name;
+}
+
+// Repeats fold into one entry; the cursor gives each call once, growth of a folded
+// entry as a new entry carrying only the new repeats.
+TEST_F(FaultsAndJournal, RepeatsFoldAndTheCursorReadsOnlyWhatIsNew)
+{
+    ISteamRemoteStorage* rs = SteamRemoteStorage();
+    auto shape = [](const simclient::Journal& j) {
+        std::vector<std::string> out;
+        for (const auto& e : j.Entries())
+            out.push_back(e.args + "x" + std::to_string(e.count) +
+                          (e.thread == std::this_thread::get_id() ? "" : " elsewhere"));
+        return out;
+    };
+    simclient::JournalMark mark = world.JournalMark();
+    rs->FileExists("a");
+    rs->FileExists("a");
+    rs->FileExists("b");
+    EXPECT_EQ(shape(world.JournalSince(mark)), (std::vector<std::string>{"\"a\"x2", "\"b\"x1"}));
+    rs->FileExists("b");
+    rs->FileExists("b");
+    std::thread([rs] { rs->FileExists("b"); }).join();
+    EXPECT_EQ(shape(world.JournalSince(mark)), (std::vector<std::string>{"\"b\"x2", "\"b\"x1 elsewhere"}));
+    EXPECT_TRUE(world.JournalSince(mark).Entries().empty());
+    EXPECT_EQ(world.GetJournal().Count("FileExists"), 6u);
+    world.ClearJournal();
+    rs->FileExists("c");
+    EXPECT_EQ(shape(world.JournalSince(mark)), (std::vector<std::string>{"\"c\"x1"}));
 }
 
 }  // namespace

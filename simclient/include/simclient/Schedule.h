@@ -8,7 +8,10 @@
 
 namespace simclient {
 
-enum class Clock { Pump, EngineMs };
+enum class Clock {
+    Pump,
+    EngineMs
+};
 
 // An absolute point: "at pump 5", "at engine time 2000 ms".
 struct Due {
