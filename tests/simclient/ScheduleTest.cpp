@@ -92,8 +92,10 @@ TEST_F(Schedule, PersonaNamesArriveOnceOrNever)
     const Row rows[] = {
         {"known now", [](simclient::World& w, uint64 id) { w.SetPersonaName(id, "Ann"); }, -1, "Ann"},
         {"after three pumps",
-         [](simclient::World& w, uint64 id) { w.SetPersonaNameArrives(id, "Bob", Delay::Pumps(3)); }, 3, "Bob"},
-        {"after the latency", [](simclient::World& w, uint64 id) { w.SetPersonaName(id, "Cy", false); }, 1, "Cy"},
+         [](simclient::World& w, uint64 id) { w.SetPersonaNameArrives(id, "Bob", Delay::Pumps(3)); }, 3,
+         "Bob"},
+        {"after the latency", [](simclient::World& w, uint64 id) { w.SetPersonaName(id, "Cy", false); }, 1,
+         "Cy"},
         {"never", [](simclient::World& w, uint64 id) { w.SetPersonaNameNever(id); }, 0, "[unknown]"},
         {"nobody the world knows", [](simclient::World&, uint64) {}, 1, "[unknown]"},
     };
