@@ -72,7 +72,8 @@ void BM_FriendsDownloadOnLargeBoard(benchmark::State& state)
     simclient::GetWorld().SetFriends(friends);
     ISteamUserStats* stats = SteamUserStats();
     for (auto _ : state) {
-        benchmark::DoNotOptimize(stats->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestFriends, 0, 0));
+        benchmark::DoNotOptimize(
+            stats->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestFriends, 0, 0));
         SteamAPI_RunCallbacks();
     }
     SteamAPI_Shutdown();
