@@ -1,5 +1,6 @@
 // Interface lookup through the inline accessors, and the small per-interface behaviours.
 #include <cstring>
+#include <iterator>
 
 #include "SimFixture.h"
 
@@ -9,27 +10,17 @@ using simclient::Interface;
 
 class Interfaces : public SimWorld {};
 
+// The accessor of each interface, in the order of simclient::Interface.
+bool (*const kAvailable[])() = {
+    [] { return SteamClient() != nullptr; },        [] { return SteamUser() != nullptr; },
+    [] { return SteamUtils() != nullptr; },         [] { return SteamApps() != nullptr; },
+    [] { return SteamFriends() != nullptr; },       [] { return SteamUserStats() != nullptr; },
+    [] { return SteamRemoteStorage() != nullptr; }, [] { return SteamUGC() != nullptr; },
+};
+static_assert(std::size(kAvailable) == simclient::kInterfaceCount);
 bool Available(Interface which)
 {
-    switch (which) {
-    case Interface::Client:
-        return SteamClient() != nullptr;
-    case Interface::User:
-        return SteamUser() != nullptr;
-    case Interface::Utils:
-        return SteamUtils() != nullptr;
-    case Interface::Apps:
-        return SteamApps() != nullptr;
-    case Interface::Friends:
-        return SteamFriends() != nullptr;
-    case Interface::UserStats:
-        return SteamUserStats() != nullptr;
-    case Interface::RemoteStorage:
-        return SteamRemoteStorage() != nullptr;
-    case Interface::UGC:
-        return SteamUGC() != nullptr;
-    }
-    return false;
+    return kAvailable[int(which)]();
 }
 
 // A stale cached pointer after an availability change would show up here.
@@ -58,8 +49,10 @@ TEST_F(Interfaces, LookupNeedsInitAndTheRightVersion)
     SteamAPI_Shutdown();
     EXPECT_EQ(SteamUser(), nullptr);
     EXPECT_EQ(SteamClient(), nullptr);
-    world.SetSteamRunning(false);  // independent of Init
+    world.SetSteamRunning(false);
     EXPECT_FALSE(SteamAPI_IsSteamRunning());
+    EXPECT_TRUE(SteamAPI_Init()) << "Init tied to IsSteamRunning";
+    SteamAPI_Shutdown();
     world.SetInitSucceeds(false);
     EXPECT_FALSE(SteamAPI_Init());
     EXPECT_EQ(SteamUtils(), nullptr);
