@@ -132,7 +132,9 @@ public:
     // WorldData::PostNow arrives in that same pump). Actions due at one pump run
     // pump-clocked first, then engine-clocked, each by due point, then in the order they
     // were scheduled. An action must not call the World or the SDK (the lock is held).
-    // A due point already passed fires at the next pump. Example:
+    // A due point already passed fires at the next pump; Reset drops what is scheduled.
+    // WorldData is declared in the library's src/WorldState.h (include it to write an
+    // action; the library's own timed behaviours are built the same way). Example:
     //   world.Schedule(Due::Pump(5), [](WorldData& d) { d.serverTime += 60; });
     void Schedule(Due due, WorldAction action);
     // The same, `delay` from now: After(Delay::Pumps(2), a) fires at PumpCount() + 2.
