@@ -1,7 +1,9 @@
 // Delivery of callbacks and call results inside SteamAPI_RunCallbacks.
 //
-// RunCallbacks: lock -> advance the pump -> take the due items -> unlock, then per item:
-//   call result: lock, take the binding for its handle, unlock, Run(p, ioFailure, handle)
+// RunCallbacks: read the engine's clock -> lock -> advance the pump -> run the scheduled
+// actions now due -> take the due items -> unlock, then per item:
+//   call result: lock, take the binding for its handle, unlock, Run(p, ioFailure, handle),
+//                lock, release what only the handler could read (afterDelivery), unlock
 //   broadcast:   lock, snapshot the objects of its number, unlock; for each object,
 //                lock, check it is still registered, unlock, Run(p)
 // Handlers may register, unregister or destroy callback objects (their own or others')
@@ -9,6 +11,8 @@
 #include "CallbackManager.h"
 
 #include <algorithm>
+#include <functional>
+#include <memory>
 #include <vector>
 
 #include "Args.h"
@@ -16,6 +20,7 @@
 
 using simclient::Args;
 using simclient::Pending;
+using simclient::Scheduled;
 using simclient::State;
 using simclient::WorldState;
 
@@ -50,7 +55,7 @@ void CCallbackMgr::Register(CCallbackBase* cb, int callbackId)
 {
     WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
-    s.Record("SteamAPI_RegisterCallback", Args(callbackId));
+    s.Record(SIM_CALL("SteamAPI_RegisterCallback"), Args(callbackId));
     if (!cb)
         return;
     if (cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered)
@@ -64,7 +69,7 @@ void CCallbackMgr::Unregister(CCallbackBase* cb)
 {
     WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
-    s.Record("SteamAPI_UnregisterCallback", Args(cb ? cb->m_iCallback : 0));
+    s.Record(SIM_CALL("SteamAPI_UnregisterCallback"), Args(cb ? cb->m_iCallback : 0));
     if (!cb || !(cb->m_nCallbackFlags & CCallbackBase::k_ECallbackFlagsRegistered))
         return;
     RemoveFrom(s, cb, cb->m_iCallback);
@@ -75,7 +80,7 @@ void CCallbackMgr::RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle)
 {
     WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
-    s.Record("SteamAPI_RegisterCallResult", Args(handle));
+    s.Record(SIM_CALL("SteamAPI_RegisterCallResult"), Args(handle));
     if (!cb || handle == k_uAPICallInvalid)
         return;
     s.callResults[handle] = cb;
@@ -85,7 +90,7 @@ void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle
 {
     WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
-    s.Record("SteamAPI_UnregisterCallResult", Args(handle));
+    s.Record(SIM_CALL("SteamAPI_UnregisterCallResult"), Args(handle));
     auto found = s.callResults.find(handle);
     if (found != s.callResults.end() && found->second == cb)
         s.callResults.erase(found);
@@ -95,17 +100,29 @@ void CCallbackMgr::RunCallbacks()
 {
     WorldState& s = State();
     // Idle fast path: with the journal off and nothing queued, a pump has nothing to do
-    // (no pending item depends on the pump count while the queue is empty).
+    // (no pending item or scheduled action depends on the pump count while there is none).
     if (!s.journalEnabled.load(std::memory_order_relaxed) &&
         s.queuedCount.load(std::memory_order_acquire) == 0)
         return;
+    // The engine's clock is read outside the world's lock: its owner may hold locks of
+    // its own that the module's threads take before calling the SDK.
+    uint64_t now = 0;
+    std::shared_ptr<const std::function<uint64_t()>> clock;
+    if (!t_dispatching)
+        clock = std::atomic_load(&s.timeSource);
+    if (clock)
+        now = (*clock)();
     std::vector<Pending> due;
     {
         std::lock_guard<std::mutex> lock(s.mutex);
-        s.Record("SteamAPI_RunCallbacks", "");
+        s.Record(SIM_CALL("SteamAPI_RunCallbacks"), "");
         if (t_dispatching || !s.initialised)
             return;
         ++s.pump;
+        if (clock)
+            s.engineMs = now;
+        for (Scheduled& action : s.TakeDueActions(clock != nullptr))
+            action.action(s);
         for (auto it = s.queue.begin(); it != s.queue.end();) {
             if (it->dueAtPump <= s.pump) {
                 due.push_back(std::move(*it));
@@ -130,11 +147,15 @@ void CCallbackMgr::RunCallbacks()
                     s.callResults.erase(found);  // the dispatcher, not the object, drops the binding
                 }
             }
-            if (!target)
-                continue;
-            std::vector<uint8> buffer(item.payload);
-            buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
-            target->Run(buffer.data(), item.ioFailure, item.handle);
+            if (target) {
+                std::vector<uint8> buffer(item.payload);
+                buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
+                target->Run(buffer.data(), item.ioFailure, item.handle);
+            }
+            if (item.afterDelivery) {
+                std::lock_guard<std::mutex> lock(s.mutex);
+                item.afterDelivery();
+            }
             continue;
         }
         std::vector<CCallbackBase*> targets;

@@ -37,7 +37,7 @@ std::mutex g_contextMutex;
 
 S_API bool S_CALLTYPE SteamAPI_Init()
 {
-    CallScope call("SteamAPI_Init", "");
+    CallScope call(SIM_CALL("SteamAPI_Init"), "");
     if (!call.state.initSucceeds || call.faults.fail)
         return false;
     call.state.initialised = true;
@@ -47,16 +47,17 @@ S_API bool S_CALLTYPE SteamAPI_Init()
 
 S_API void S_CALLTYPE SteamAPI_Shutdown()
 {
-    CallScope call("SteamAPI_Shutdown", "");
+    CallScope call(SIM_CALL("SteamAPI_Shutdown"), "");
     call.state.initialised = false;
     call.state.queue.clear();
+    call.state.downloads.clear();  // their results will never be handled
     call.state.SyncQueuedCount();  // results of calls in flight are lost with the connection
     call.state.BumpGeneration();
 }
 
 S_API bool S_CALLTYPE SteamAPI_IsSteamRunning()
 {
-    CallScope call("SteamAPI_IsSteamRunning", "");
+    CallScope call(SIM_CALL("SteamAPI_IsSteamRunning"), "");
     return call.state.steamRunning && !call.faults.fail;
 }
 

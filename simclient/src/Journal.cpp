@@ -15,7 +15,7 @@ std::size_t Journal::Count(const std::string& name) const
 {
     std::size_t n = 0;
     for (const JournalEntry& e : entries_)
-        n += e.name == name ? 1 : 0;
+        n += e.name == name ? e.count : 0;
     return n;
 }
 

@@ -23,15 +23,15 @@ class SimSteamApps final : public ISteamApps {
 public:
     const char* GetCurrentGameLanguage() override
     {
-        CallScope call("GetCurrentGameLanguage", "");
+        CallScope call(SIM_CALL("GetCurrentGameLanguage"), "");
         if (call.faults.fail || !call.state.language)
             return nullptr;
-        return call.state.language->c_str();
+        return call.state.Intern(*call.state.language);
     }
 
     bool GetCurrentBetaName(char* pchName, int cchNameBufferSize) override
     {
-        CallScope call("GetCurrentBetaName", Args(pchName, cchNameBufferSize));
+        CallScope call(SIM_CALL("GetCurrentBetaName"), Args(pchName, cchNameBufferSize));
         if (call.faults.fail || !call.state.beta)
             return false;
         CopyOut(*call.state.beta, pchName, cchNameBufferSize);
@@ -40,7 +40,7 @@ public:
 
     bool BIsDlcInstalled(AppId_t appID) override
     {
-        CallScope call("BIsDlcInstalled", Args(appID));
+        CallScope call(SIM_CALL("BIsDlcInstalled"), Args(appID));
         if (call.faults.fail)
             return false;
         for (const Dlc& dlc : call.state.dlcs)
@@ -51,14 +51,15 @@ public:
 
     int GetDLCCount() override
     {
-        CallScope call("GetDLCCount", "");
+        CallScope call(SIM_CALL("GetDLCCount"), "");
         return call.faults.fail ? 0 : static_cast<int>(call.state.dlcs.size());
     }
 
     bool BGetDLCDataByIndex(int iDLC, AppId_t* pAppID, bool* pbAvailable, char* pchName,
                             int cchNameBufferSize) override
     {
-        CallScope call("BGetDLCDataByIndex", Args(iDLC, pAppID, pbAvailable, pchName, cchNameBufferSize));
+        CallScope call(SIM_CALL("BGetDLCDataByIndex"),
+                       Args(iDLC, pAppID, pbAvailable, pchName, cchNameBufferSize));
         const auto& dlcs = call.state.dlcs;
         if (call.faults.fail || iDLC < 0 || iDLC >= static_cast<int>(dlcs.size()))
             return false;

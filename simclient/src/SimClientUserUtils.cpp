@@ -10,7 +10,7 @@ class SimSteamClient final : public ISteamClient {
 public:
     void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override
     {
-        CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
+        CallScope call(SIM_CALL("SetWarningMessageHook"), Args(pFunction ? "hook" : "null"));
         call.state.warningHook = pFunction;
     }
 };
@@ -19,12 +19,12 @@ class SimSteamUser final : public ISteamUser {
 public:
     bool BLoggedOn() override
     {
-        CallScope call("BLoggedOn", "");
+        CallScope call(SIM_CALL("BLoggedOn"), "");
         return call.state.loggedOn && !call.faults.fail;
     }
     CSteamID GetSteamID() override
     {
-        CallScope call("GetSteamID", "");
+        CallScope call(SIM_CALL("GetSteamID"), "");
         return call.faults.fail ? CSteamID() : CSteamID(call.state.userId);
     }
 };
@@ -33,27 +33,27 @@ class SimSteamUtils final : public ISteamUtils {
 public:
     uint32 GetServerRealTime() override
     {
-        CallScope call("GetServerRealTime", "");
+        CallScope call(SIM_CALL("GetServerRealTime"), "");
         return call.faults.fail ? 0 : call.state.serverTime;
     }
     uint32 GetAppID() override
     {
-        CallScope call("GetAppID", "");
+        CallScope call(SIM_CALL("GetAppID"), "");
         return call.faults.fail ? 0 : call.state.appId;
     }
     void SetOverlayNotificationPosition(ENotificationPosition position) override
     {
-        CallScope call("SetOverlayNotificationPosition", Args(position));
+        CallScope call(SIM_CALL("SetOverlayNotificationPosition"), Args(position));
         call.state.notificationPosition = position;
     }
     void SetWarningMessageHook(SteamAPIWarningMessageHook_t pFunction) override
     {
-        CallScope call("SetWarningMessageHook", Args(pFunction ? "hook" : "null"));
+        CallScope call(SIM_CALL("SetWarningMessageHook"), Args(pFunction ? "hook" : "null"));
         call.state.warningHook = pFunction;
     }
     bool IsOverlayEnabled() override
     {
-        CallScope call("IsOverlayEnabled", "");
+        CallScope call(SIM_CALL("IsOverlayEnabled"), "");
         return call.state.overlayEnabled && !call.faults.fail;
     }
 };

@@ -1,4 +1,6 @@
 // ISteamFriends: persona names and the overlay requests (recorded, never shown).
+#include <algorithm>
+
 #include "Args.h"
 #include "SimInterfaces.h"
 #include "WorldState.h"
@@ -10,51 +12,68 @@ class SimSteamFriends final : public ISteamFriends {
 public:
     const char* GetFriendPersonaName(CSteamID steamIDFriend) override
     {
-        CallScope call("GetFriendPersonaName", Args(steamIDFriend));
+        CallScope call(SIM_CALL("GetFriendPersonaName"), Args(steamIDFriend));
         WorldState& s = call.state;
         uint64 id = steamIDFriend.ConvertToUint64();
         if (call.faults.fail)
             return "";
         if (id == s.userId)
-            return s.personaName.c_str();
+            return s.Intern(s.personaName);
         auto found = s.personas.find(id);
-        if (found == s.personas.end() || !found->second.second)
+        if (found == s.personas.end() || found->second.arrival != Persona::Arrival::Known)
             return "[unknown]";
-        return found->second.first.c_str();
+        return s.Intern(found->second.name);
     }
 
     void ActivateGameOverlayToWebPage(const char* pchURL, EActivateGameOverlayToWebPageMode eMode) override
     {
-        CallScope call("ActivateGameOverlayToWebPage", Args(pchURL, eMode));
+        CallScope call(SIM_CALL("ActivateGameOverlayToWebPage"), Args(pchURL, eMode));
         call.state.webRequests.emplace_back(pchURL ? pchURL : "", eMode);
     }
 
     void ActivateGameOverlayToStore(AppId_t nAppID, EOverlayToStoreFlag eFlag) override
     {
-        CallScope call("ActivateGameOverlayToStore", Args(nAppID, eFlag));
+        CallScope call(SIM_CALL("ActivateGameOverlayToStore"), Args(nAppID, eFlag));
         call.state.storeRequests.emplace_back(nAppID, eFlag);
     }
 
-    // True (and a PersonaStateChange_t later) only when the name still has to be fetched.
+    // True while the name is not known. The first such request starts the one lookup
+    // (World::SetPersonaNameArrives); its end makes the name known and posts the change.
     bool RequestUserInformation(CSteamID steamIDUser, bool bRequireNameOnly) override
     {
-        CallScope call("RequestUserInformation", Args(steamIDUser, bRequireNameOnly));
+        CallScope call(SIM_CALL("RequestUserInformation"), Args(steamIDUser, bRequireNameOnly));
         WorldState& s = call.state;
         uint64 id = steamIDUser.ConvertToUint64();
-        if (call.faults.fail)
+        if (call.faults.fail || id == s.userId)
             return false;
         auto found = s.personas.find(id);
-        if (id == s.userId || (found != s.personas.end() && found->second.second))
+        if (found == s.personas.end())  // nobody the world knows: the lookup finds no name
+            found = s.personas
+                        .emplace(id, Persona{"[unknown]", Persona::Arrival::OnRequest,
+                                             Delay::Pumps(static_cast<uint64_t>(s.latency)), false})
+                        .first;
+        Persona& persona = found->second;
+        if (persona.arrival == Persona::Arrival::Known)
             return false;
-        PersonaStateChange_t change{};
-        change.m_ulSteamID = id;
-        change.m_nChangeFlags = k_EPersonaChangeName;
-        s.QueueCallback(PersonaStateChange_t::k_iCallback, &change, sizeof change, call.faults.extraLatency,
-                        [&s, id] {
-                            auto it = s.personas.find(id);
-                            if (it != s.personas.end())
-                                it->second.second = true;
-                        });
+        if (persona.arrival == Persona::Arrival::OnRequest && !persona.lookingUp) {
+            persona.lookingUp = true;
+            Delay delay = persona.delay;
+            if (delay.clock == Clock::Pump)
+                delay.amount = static_cast<uint64_t>(
+                    std::max<int64_t>(1, static_cast<int64_t>(delay.amount) + call.faults.extraLatency));
+            s.ScheduleAt(s.DueAfter(delay), [id](WorldData& d) {
+                auto it = d.personas.find(id);
+                if (it == d.personas.end() || it->second.arrival != Persona::Arrival::OnRequest)
+                    return;
+                it->second.arrival = Persona::Arrival::Known;
+                it->second.lookingUp = false;
+                PersonaStateChange_t change{};
+                change.m_ulSteamID = id;
+                change.m_nChangeFlags = k_EPersonaChangeName;
+                d.PostNow(change);
+            });
+            s.SyncQueuedCount();
+        }
         return true;
     }
 };

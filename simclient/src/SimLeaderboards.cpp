@@ -18,13 +18,29 @@ Leaderboard* BoardOf(WorldState& s, SteamLeaderboard_t handle)
     return &s.leaderboards[handle - 1];
 }
 
+// Ranks (1-based) of the given users on the board, best first, each once.
+std::vector<std::size_t> RowsOfUsers(const Leaderboard& board, std::vector<uint64> users)
+{
+    std::vector<std::size_t> indices;
+    std::sort(users.begin(), users.end());
+    users.erase(std::unique(users.begin(), users.end()), users.end());
+    for (uint64 user : users)
+        if (int rank = RankOf(board, user))
+            indices.push_back(static_cast<std::size_t>(rank - 1));
+    std::sort(indices.begin(), indices.end());
+    return indices;
+}
+
 // Stores a snapshot of the rows at `indices` as a downloaded-entries set, posts the result.
+// The set lives until the result has been dispatched: the handler is where it is read.
 SteamAPICall_t PostDownload(WorldState& s, const AppliedFaults& faults, Leaderboard* board,
                             SteamLeaderboard_t handle, const std::vector<std::size_t>& indices)
 {
     LeaderboardScoresDownloaded_t result{};
     result.m_hSteamLeaderboard = handle;
     bool failed = faults.fail || !board || (faults.result && *faults.result != k_EResultOK);
+    bool delivered = !faults.zeroHandle && !faults.drop;
+    std::function<void()> release;
     if (!failed) {
         DownloadedEntries entries;
         for (std::size_t i : indices) {
@@ -38,11 +54,16 @@ SteamAPICall_t PostDownload(WorldState& s, const AppliedFaults& faults, Leaderbo
             entries.entries.push_back(entry);
             entries.details.push_back(row.details);
         }
-        result.m_hSteamLeaderboardEntries = s.nextEntriesHandle++;
+        const SteamLeaderboardEntries_t set = s.nextEntriesHandle++;
+        result.m_hSteamLeaderboardEntries = set;
         result.m_cEntryCount = static_cast<int>(entries.entries.size());
-        s.downloads[result.m_hSteamLeaderboardEntries] = std::move(entries);
+        if (delivered) {
+            s.downloads[set] = std::move(entries);
+            release = [&s, set] { s.downloads.erase(set); };
+        }
     }
-    return QueueResult(s, result, faults);
+    return s.QueueCallResult(LeaderboardScoresDownloaded_t::k_iCallback, &result, sizeof result, faults,
+                             std::move(release));
 }
 
 }  // namespace
@@ -51,7 +72,7 @@ SteamAPICall_t SimSteamUserStats::FindOrCreateLeaderboard(const char* pchLeaderb
                                                           ELeaderboardSortMethod sort,
                                                           ELeaderboardDisplayType display)
 {
-    CallScope call("FindOrCreateLeaderboard", Args(pchLeaderboardName, sort, display));
+    CallScope call(SIM_CALL("FindOrCreateLeaderboard"), Args(pchLeaderboardName, sort, display));
     WorldState& s = call.state;
     if (!pchLeaderboardName || std::strlen(pchLeaderboardName) >= k_cchLeaderboardNameMax)
         return k_uAPICallInvalid;
@@ -78,14 +99,14 @@ SteamAPICall_t SimSteamUserStats::FindOrCreateLeaderboard(const char* pchLeaderb
 
 const char* SimSteamUserStats::GetLeaderboardName(SteamLeaderboard_t hSteamLeaderboard)
 {
-    CallScope call("GetLeaderboardName", Args(hSteamLeaderboard));
+    CallScope call(SIM_CALL("GetLeaderboardName"), Args(hSteamLeaderboard));
     Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
-    return board && !call.faults.fail ? board->name.c_str() : "";
+    return board && !call.faults.fail ? call.state.Intern(board->name) : "";
 }
 
 int SimSteamUserStats::GetLeaderboardEntryCount(SteamLeaderboard_t hSteamLeaderboard)
 {
-    CallScope call("GetLeaderboardEntryCount", Args(hSteamLeaderboard));
+    CallScope call(SIM_CALL("GetLeaderboardEntryCount"), Args(hSteamLeaderboard));
     Leaderboard* board = BoardOf(call.state, hSteamLeaderboard);
     return board && !call.faults.fail ? static_cast<int>(board->rows.size()) : 0;
 }
@@ -94,7 +115,7 @@ SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntries(SteamLeaderboard_t 
                                                              ELeaderboardDataRequest request, int start,
                                                              int end)
 {
-    CallScope call("DownloadLeaderboardEntries", Args(handle, request, start, end));
+    CallScope call(SIM_CALL("DownloadLeaderboardEntries"), Args(handle, request, start, end));
     WorldState& s = call.state;
     Leaderboard* board = BoardOf(s, handle);
     if (!board || request == k_ELeaderboardDataRequestUsers)
@@ -112,11 +133,9 @@ SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntries(SteamLeaderboard_t 
             last = std::min(rank + end, count);
         }
     } else if (request == k_ELeaderboardDataRequestFriends) {
-        for (int i = 0; i < count; ++i) {
-            uint64 user = board->rows[static_cast<std::size_t>(i)].steamId;
-            if (user == s.userId || std::find(s.friends.begin(), s.friends.end(), user) != s.friends.end())
-                indices.push_back(static_cast<std::size_t>(i));
-        }
+        std::vector<uint64> users = s.friends;
+        users.push_back(s.userId);
+        indices = RowsOfUsers(*board, std::move(users));
     }
     for (int rank = first; rank >= 1 && rank <= last; ++rank)
         indices.push_back(static_cast<std::size_t>(rank - 1));
@@ -126,26 +145,22 @@ SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntries(SteamLeaderboard_t 
 SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntriesForUsers(SteamLeaderboard_t handle,
                                                                      CSteamID* prgUsers, int cUsers)
 {
-    CallScope call("DownloadLeaderboardEntriesForUsers", Args(handle, cUsers));
+    CallScope call(SIM_CALL("DownloadLeaderboardEntriesForUsers"), Args(handle, cUsers));
     WorldState& s = call.state;
     Leaderboard* board = BoardOf(s, handle);
     if (!board || cUsers < 0 || cUsers > 100 || (cUsers > 0 && !prgUsers))
         return k_uAPICallInvalid;
-    std::vector<std::size_t> indices;
-    for (std::size_t i = 0; i < board->rows.size(); ++i)
-        for (int u = 0; u < cUsers; ++u)
-            if (prgUsers[u].ConvertToUint64() == board->rows[i].steamId) {
-                indices.push_back(i);
-                break;
-            }
-    return PostDownload(s, call.faults, board, handle, indices);
+    std::vector<uint64> users;
+    for (int u = 0; u < cUsers; ++u)
+        users.push_back(prgUsers[u].ConvertToUint64());
+    return PostDownload(s, call.faults, board, handle, RowsOfUsers(*board, std::move(users)));
 }
 
 bool SimSteamUserStats::GetDownloadedLeaderboardEntry(SteamLeaderboardEntries_t handle, int index,
                                                       LeaderboardEntry_t* pEntry, int32* pDetails,
                                                       int cDetailsMax)
 {
-    CallScope call("GetDownloadedLeaderboardEntry", Args(handle, index, cDetailsMax));
+    CallScope call(SIM_CALL("GetDownloadedLeaderboardEntry"), Args(handle, index, cDetailsMax));
     auto found = call.state.downloads.find(handle);
     if (call.faults.fail || found == call.state.downloads.end() || index < 0 ||
         index >= static_cast<int>(found->second.entries.size()))
@@ -164,7 +179,8 @@ SteamAPICall_t SimSteamUserStats::UploadLeaderboardScore(SteamLeaderboard_t hand
                                                          ELeaderboardUploadScoreMethod method, int32 nScore,
                                                          const int32* pScoreDetails, int cScoreDetailsCount)
 {
-    CallScope call("UploadLeaderboardScore", Args(handle, method, nScore, pScoreDetails, cScoreDetailsCount));
+    CallScope call(SIM_CALL("UploadLeaderboardScore"),
+                   Args(handle, method, nScore, pScoreDetails, cScoreDetailsCount));
     WorldState& s = call.state;
     Leaderboard* board = BoardOf(s, handle);
     if (!board || cScoreDetailsCount < 0 || cScoreDetailsCount > k_cLeaderboardDetailsMax)
@@ -180,15 +196,13 @@ SteamAPICall_t SimSteamUserStats::UploadLeaderboardScore(SteamLeaderboard_t hand
         bool replace = previous == 0 || method == k_ELeaderboardUploadScoreMethodForceUpdate ||
                        Better(board->sort, nScore, board->rows[previous - 1].score);
         if (replace) {
-            if (previous)
-                board->rows.erase(board->rows.begin() + (previous - 1));
+            EraseRow(*board, s.userId);
             LeaderboardRow row;
             row.steamId = s.userId;
             row.score = nScore;
             if (pScoreDetails)
                 row.details.assign(pScoreDetails, pScoreDetails + cScoreDetailsCount);
-            board->rows.push_back(row);
-            SortRows(*board);
+            InsertRow(*board, std::move(row));
             result.m_bScoreChanged = 1;
         }
         result.m_nGlobalRankNew = RankOf(*board, s.userId);

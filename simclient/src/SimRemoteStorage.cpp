@@ -13,7 +13,7 @@ class SimSteamRemoteStorage final : public ISteamRemoteStorage {
 public:
     bool FileWrite(const char* pchFile, const void* pvData, int32 cubData) override
     {
-        CallScope call("FileWrite", Args(pchFile, cubData));
+        CallScope call(SIM_CALL("FileWrite"), Args(pchFile, cubData));
         if (call.faults.fail || !pchFile || !*pchFile || cubData < 0 ||
             static_cast<uint32>(cubData) > k_unMaxCloudFileChunkSize || (cubData > 0 && !pvData))
             return false;
@@ -24,7 +24,7 @@ public:
 
     int32 FileRead(const char* pchFile, void* pvData, int32 cubDataToRead) override
     {
-        CallScope call("FileRead", Args(pchFile, cubDataToRead));
+        CallScope call(SIM_CALL("FileRead"), Args(pchFile, cubDataToRead));
         if (call.faults.fail || !pchFile || !pvData || cubDataToRead <= 0)
             return 0;
         auto found = call.state.files.find(pchFile);
@@ -40,7 +40,7 @@ public:
 
     bool FileDelete(const char* pchFile) override
     {
-        CallScope call("FileDelete", Args(pchFile));
+        CallScope call(SIM_CALL("FileDelete"), Args(pchFile));
         if (call.faults.fail || !pchFile)
             return false;
         return call.state.files.erase(pchFile) > 0;
@@ -48,7 +48,7 @@ public:
 
     bool FileExists(const char* pchFile) override
     {
-        CallScope call("FileExists", Args(pchFile));
+        CallScope call(SIM_CALL("FileExists"), Args(pchFile));
         if (call.faults.fail || !pchFile)
             return false;
         return call.state.files.count(pchFile) > 0;
@@ -56,7 +56,7 @@ public:
 
     int32 GetFileSize(const char* pchFile) override
     {
-        CallScope call("GetFileSize", Args(pchFile));
+        CallScope call(SIM_CALL("GetFileSize"), Args(pchFile));
         if (call.faults.fail || !pchFile)
             return 0;
         auto found = call.state.files.find(pchFile);
@@ -65,7 +65,7 @@ public:
 
     void SetCloudEnabledForApp(bool bEnabled) override
     {
-        CallScope call("SetCloudEnabledForApp", Args(bEnabled));
+        CallScope call(SIM_CALL("SetCloudEnabledForApp"), Args(bEnabled));
         call.state.cloudEnabledForApp = bEnabled;
     }
 };

@@ -30,7 +30,7 @@ class SimSteamUGC final : public ISteamUGC {
 public:
     UGCQueryHandle_t CreateQueryUGCDetailsRequest(PublishedFileId_t* ids, uint32 count) override
     {
-        CallScope call("CreateQueryUGCDetailsRequest", Args(ids, count));
+        CallScope call(SIM_CALL("CreateQueryUGCDetailsRequest"), Args(ids, count));
         if (call.faults.fail || (count > 0 && !ids) || count > kNumUGCResultsPerPage)
             return k_UGCQueryHandleInvalid;
         UgcQuery query;
@@ -42,7 +42,7 @@ public:
 
     SteamAPICall_t SendQueryUGCRequest(UGCQueryHandle_t handle) override
     {
-        CallScope call("SendQueryUGCRequest", Args(handle));
+        CallScope call(SIM_CALL("SendQueryUGCRequest"), Args(handle));
         auto found = call.state.queries.find(handle);
         if (found == call.state.queries.end() || found->second.sent)
             return k_uAPICallInvalid;
@@ -60,7 +60,7 @@ public:
 
     bool GetQueryUGCResult(UGCQueryHandle_t handle, uint32 index, SteamUGCDetails_t* pDetails) override
     {
-        CallScope call("GetQueryUGCResult", Args(handle, index));
+        CallScope call(SIM_CALL("GetQueryUGCResult"), Args(handle, index));
         auto found = call.state.queries.find(handle);
         if (call.faults.fail || !pDetails || found == call.state.queries.end() || !found->second.completed ||
             index >= found->second.ids.size())
@@ -93,13 +93,13 @@ public:
 
     bool ReleaseQueryUGCRequest(UGCQueryHandle_t handle) override
     {
-        CallScope call("ReleaseQueryUGCRequest", Args(handle));
+        CallScope call(SIM_CALL("ReleaseQueryUGCRequest"), Args(handle));
         return call.state.queries.erase(handle) > 0;
     }
 
     SteamAPICall_t CreateItem(AppId_t nConsumerAppId, EWorkshopFileType eFileType) override
     {
-        CallScope call("CreateItem", Args(nConsumerAppId, eFileType));
+        CallScope call(SIM_CALL("CreateItem"), Args(nConsumerAppId, eFileType));
         WorldState& s = call.state;
         CreateItemResult_t result{};
         result.m_eResult = call.faults.fail ? k_EResultFail : call.faults.result.value_or(k_EResultOK);
@@ -118,7 +118,7 @@ public:
 
     UGCUpdateHandle_t StartItemUpdate(AppId_t appId, PublishedFileId_t id) override
     {
-        CallScope call("StartItemUpdate", Args(appId, id));
+        CallScope call(SIM_CALL("StartItemUpdate"), Args(appId, id));
         if (call.faults.fail || id == k_PublishedFileIdInvalid)
             return k_UGCUpdateHandleInvalid;
         UGCUpdateHandle_t handle = call.state.nextUpdateHandle++;
@@ -130,25 +130,25 @@ public:
 
     bool SetItemTitle(UGCUpdateHandle_t handle, const char* text) override
     {
-        return SetField("SetItemTitle", handle, text, &WorkshopSubmission::title);
+        return SetField(SIM_CALL("SetItemTitle"), handle, text, &WorkshopSubmission::title);
     }
     bool SetItemDescription(UGCUpdateHandle_t handle, const char* text) override
     {
-        return SetField("SetItemDescription", handle, text, &WorkshopSubmission::description);
+        return SetField(SIM_CALL("SetItemDescription"), handle, text, &WorkshopSubmission::description);
     }
     bool SetItemContent(UGCUpdateHandle_t handle, const char* folder) override
     {
-        return SetField("SetItemContent", handle, folder, &WorkshopSubmission::content);
+        return SetField(SIM_CALL("SetItemContent"), handle, folder, &WorkshopSubmission::content);
     }
     bool SetItemPreview(UGCUpdateHandle_t handle, const char* file) override
     {
-        return SetField("SetItemPreview", handle, file, &WorkshopSubmission::preview);
+        return SetField(SIM_CALL("SetItemPreview"), handle, file, &WorkshopSubmission::preview);
     }
 
     bool SetItemVisibility(UGCUpdateHandle_t handle,
                            ERemoteStoragePublishedFileVisibility visibility) override
     {
-        CallScope call("SetItemVisibility", Args(handle, visibility));
+        CallScope call(SIM_CALL("SetItemVisibility"), Args(handle, visibility));
         auto found = call.state.updates.find(handle);
         if (call.faults.fail || found == call.state.updates.end())
             return false;
@@ -162,7 +162,7 @@ public:
         if (pTags && pTags->m_ppStrings)
             for (int32 i = 0; i < pTags->m_nNumStrings; ++i)
                 list += (i ? "," : "") + std::string(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
-        CallScope call("SetItemTags", Args(handle, list));
+        CallScope call(SIM_CALL("SetItemTags"), Args(handle, list));
         auto found = call.state.updates.find(handle);
         if (call.faults.fail || !pTags || found == call.state.updates.end())
             return false;
@@ -175,7 +175,7 @@ public:
 
     SteamAPICall_t SubmitItemUpdate(UGCUpdateHandle_t handle, const char* pchChangeNote) override
     {
-        CallScope call("SubmitItemUpdate", Args(handle, pchChangeNote));
+        CallScope call(SIM_CALL("SubmitItemUpdate"), Args(handle, pchChangeNote));
         WorldState& s = call.state;
         auto found = s.updates.find(handle);
         if (found == s.updates.end())
@@ -211,7 +211,7 @@ public:
     EItemUpdateStatus GetItemUpdateProgress(UGCUpdateHandle_t handle, uint64* processed,
                                             uint64* total) override
     {
-        CallScope call("GetItemUpdateProgress", Args(handle));
+        CallScope call(SIM_CALL("GetItemUpdateProgress"), Args(handle));
         if (call.faults.fail || !call.state.updates.count(handle))
             return k_EItemUpdateStatusInvalid;
         if (processed)
@@ -223,17 +223,18 @@ public:
 
     SteamAPICall_t SubscribeItem(PublishedFileId_t id) override
     {
-        return ChangeSubscription<RemoteStorageSubscribePublishedFileResult_t>("SubscribeItem", id, true);
+        return ChangeSubscription<RemoteStorageSubscribePublishedFileResult_t>(SIM_CALL("SubscribeItem"), id,
+                                                                               true);
     }
     SteamAPICall_t UnsubscribeItem(PublishedFileId_t id) override
     {
-        return ChangeSubscription<RemoteStorageUnsubscribePublishedFileResult_t>("UnsubscribeItem", id,
-                                                                                 false);
+        return ChangeSubscription<RemoteStorageUnsubscribePublishedFileResult_t>(SIM_CALL("UnsubscribeItem"),
+                                                                                 id, false);
     }
 
     uint32 GetNumSubscribedItems() override
     {
-        CallScope call("GetNumSubscribedItems", "");
+        CallScope call(SIM_CALL("GetNumSubscribedItems"), "");
         if (call.faults.fail)
             return 0;
         uint32 n = 0;
@@ -244,7 +245,7 @@ public:
 
     uint32 GetSubscribedItems(PublishedFileId_t* ids, uint32 cMaxEntries) override
     {
-        CallScope call("GetSubscribedItems", Args(ids, cMaxEntries));
+        CallScope call(SIM_CALL("GetSubscribedItems"), Args(ids, cMaxEntries));
         if (call.faults.fail || !ids)
             return 0;
         uint32 n = 0;
@@ -256,7 +257,7 @@ public:
 
     uint32 GetItemState(PublishedFileId_t id) override
     {
-        CallScope call("GetItemState", Args(id));
+        CallScope call(SIM_CALL("GetItemState"), Args(id));
         auto found = call.state.items.find(id);
         if (call.faults.fail || found == call.state.items.end())
             return k_EItemStateNone;
@@ -266,7 +267,7 @@ public:
     bool GetItemInstallInfo(PublishedFileId_t id, uint64* sizeOnDisk, char* folder, uint32 cchFolderSize,
                             uint32* timeStamp) override
     {
-        CallScope call("GetItemInstallInfo", Args(id, cchFolderSize));
+        CallScope call(SIM_CALL("GetItemInstallInfo"), Args(id, cchFolderSize));
         auto found = call.state.items.find(id);
         if (call.faults.fail || found == call.state.items.end() ||
             !(found->second.state & k_EItemStateInstalled))
@@ -286,7 +287,7 @@ public:
 
     bool GetItemDownloadInfo(PublishedFileId_t id, uint64* downloaded, uint64* total) override
     {
-        CallScope call("GetItemDownloadInfo", Args(id));
+        CallScope call(SIM_CALL("GetItemDownloadInfo"), Args(id));
         auto found = call.state.items.find(id);
         if (call.faults.fail || found == call.state.items.end() || found->second.bytesTotal == 0)
             return false;
@@ -298,7 +299,7 @@ public:
     }
 
 private:
-    bool SetField(const char* name, UGCUpdateHandle_t handle, const char* text,
+    bool SetField(CallName name, UGCUpdateHandle_t handle, const char* text,
                   std::optional<std::string> WorkshopSubmission::*field)
     {
         CallScope call(name, Args(handle, text));
@@ -310,7 +311,7 @@ private:
     }
 
     template <class Result>
-    SteamAPICall_t ChangeSubscription(const char* name, PublishedFileId_t id, bool subscribe)
+    SteamAPICall_t ChangeSubscription(CallName name, PublishedFileId_t id, bool subscribe)
     {
         CallScope call(name, Args(id));
         WorldState& s = call.state;

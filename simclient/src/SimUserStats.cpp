@@ -19,7 +19,7 @@ uint64 GameIdOr(uint64 configured, AppId_t appId)
 
 bool SimSteamUserStats::RequestCurrentStats()
 {
-    CallScope call("RequestCurrentStats", "");
+    CallScope call(SIM_CALL("RequestCurrentStats"), "");
     WorldState& s = call.state;
     if (call.faults.fail || !s.loggedOn)
         return false;
@@ -33,7 +33,7 @@ bool SimSteamUserStats::RequestCurrentStats()
 
 bool SimSteamUserStats::GetStat(const char* pchName, int32* pData)
 {
-    CallScope call("GetStat", Args(pchName));
+    CallScope call(SIM_CALL("GetStat"), Args(pchName));
     if (call.faults.fail || !pchName || !pData)
         return false;
     auto found = call.state.stats.find(pchName);
@@ -45,7 +45,7 @@ bool SimSteamUserStats::GetStat(const char* pchName, int32* pData)
 
 bool SimSteamUserStats::GetStat(const char* pchName, float* pData)
 {
-    CallScope call("GetStatFloat", Args(pchName));
+    CallScope call(SIM_CALL("GetStatFloat"), Args(pchName));
     if (call.faults.fail || !pchName || !pData)
         return false;
     auto found = call.state.stats.find(pchName);
@@ -57,7 +57,7 @@ bool SimSteamUserStats::GetStat(const char* pchName, float* pData)
 
 bool SimSteamUserStats::SetStat(const char* pchName, int32 nData)
 {
-    CallScope call("SetStat", Args(pchName, nData));
+    CallScope call(SIM_CALL("SetStat"), Args(pchName, nData));
     if (call.faults.fail || !pchName)
         return false;
     auto found = call.state.stats.find(pchName);
@@ -69,7 +69,7 @@ bool SimSteamUserStats::SetStat(const char* pchName, int32 nData)
 
 bool SimSteamUserStats::SetStat(const char* pchName, float fData)
 {
-    CallScope call("SetStatFloat", Args(pchName, fData));
+    CallScope call(SIM_CALL("SetStatFloat"), Args(pchName, fData));
     if (call.faults.fail || !pchName)
         return false;
     auto found = call.state.stats.find(pchName);
@@ -81,7 +81,7 @@ bool SimSteamUserStats::SetStat(const char* pchName, float fData)
 
 bool SimSteamUserStats::SetAchievement(const char* pchName)
 {
-    CallScope call("SetAchievement", Args(pchName));
+    CallScope call(SIM_CALL("SetAchievement"), Args(pchName));
     if (call.faults.fail || !pchName)
         return false;
     auto found = call.state.achievements.find(pchName);
@@ -95,7 +95,7 @@ bool SimSteamUserStats::SetAchievement(const char* pchName)
 
 bool SimSteamUserStats::StoreStats()
 {
-    CallScope call("StoreStats", "");
+    CallScope call(SIM_CALL("StoreStats"), "");
     WorldState& s = call.state;
     if (call.faults.fail || !s.loggedOn)
         return false;

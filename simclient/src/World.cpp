@@ -1,6 +1,8 @@
 // The control API: every member takes the world lock for the duration of its own work.
 #include "simclient/World.h"
 
+#include <stdexcept>
+
 #include "LeaderboardRank.h"
 #include "WorldState.h"
 
@@ -12,6 +14,14 @@ std::unique_lock<std::mutex> Lock()
     return std::unique_lock<std::mutex>(State().mutex);
 }
 }  // namespace
+
+std::string KnownCallList()
+{
+    std::string list;
+    for (std::string_view name : kCallNames)
+        list.append(list.empty() ? "" : ", ").append(name);
+    return list;
+}
 
 World& GetWorld()
 {
@@ -150,8 +160,45 @@ std::size_t World::BoundCallResultCount() const
     return State().callResults.size();
 }
 
+void World::Schedule(Due due, WorldAction action)
+{
+    auto l = Lock();
+    State().ScheduleAt(due, std::move(action));
+    State().SyncQueuedCount();
+}
+void World::After(Delay delay, WorldAction action)
+{
+    auto l = Lock();
+    State().ScheduleAt(State().DueAfter(delay), std::move(action));
+    State().SyncQueuedCount();
+}
+std::size_t World::ScheduledCount() const
+{
+    auto l = Lock();
+    return State().scheduled.size();
+}
+void World::SetTimeSource(std::function<uint64_t()> nowMs)
+{
+    std::shared_ptr<const std::function<uint64_t()>> source;
+    if (nowMs)
+        source = std::make_shared<const std::function<uint64_t()>>(std::move(nowMs));
+    std::atomic_store(&State().timeSource, std::move(source));
+}
+
+void World::SetCallObserver(std::function<void(const char* name, const std::string& args)> observer)
+{
+    std::shared_ptr<const std::function<void(const char*, const std::string&)>> kept;
+    if (observer)
+        kept =
+            std::make_shared<const std::function<void(const char*, const std::string&)>>(std::move(observer));
+    std::atomic_store(&State().callObserver, std::move(kept));
+}
+
 void World::InjectFault(const std::string& call, Fault fault)
 {
+    if (CallIndex(call) < 0)
+        throw std::invalid_argument("no call named \"" + call +
+                                    "\" to inject a fault into; known calls: " + KnownCallList());
     auto l = Lock();
     State().faults[call].push_back(fault);
 }
@@ -166,10 +213,34 @@ Journal World::GetJournal() const
     auto l = Lock();
     return Journal(State().journal);
 }
+simclient::JournalMark World::JournalMark() const
+{
+    auto l = Lock();
+    const WorldState& s = State();
+    return simclient::JournalMark{s.journalEpoch, s.journal.size(),
+                                  s.journal.empty() ? 0 : s.journal.back().count};
+}
+Journal World::JournalSince(simclient::JournalMark& mark) const
+{
+    auto l = Lock();
+    const WorldState& s = State();
+    if (mark.epoch != s.journalEpoch || mark.end > s.journal.size())
+        mark = simclient::JournalMark{s.journalEpoch, 0, 0};
+    std::vector<JournalEntry> fresh;
+    if (mark.end > 0 && s.journal[mark.end - 1].count > mark.lastCount) {
+        fresh.push_back(s.journal[mark.end - 1]);
+        fresh.back().count -= mark.lastCount;
+    }
+    fresh.insert(fresh.end(), s.journal.begin() + static_cast<std::ptrdiff_t>(mark.end), s.journal.end());
+    mark.end = s.journal.size();
+    mark.lastCount = s.journal.empty() ? 0 : s.journal.back().count;
+    return Journal(std::move(fresh));
+}
 void World::ClearJournal()
 {
     auto l = Lock();
     State().journal.clear();
+    ++State().journalEpoch;
 }
 void World::SetJournalEnabled(bool enabled)
 {
@@ -255,7 +326,21 @@ std::optional<bool> World::CloudEnabledForApp() const
 void World::SetPersonaName(uint64 steamId, const std::string& name, bool known)
 {
     auto l = Lock();
-    State().personas[steamId] = {name, known};
+    if (known)
+        State().personas[steamId] = Persona{name, Persona::Arrival::Known, {}, false};
+    else
+        State().personas[steamId] = Persona{name, Persona::Arrival::OnRequest,
+                                            Delay::Pumps(static_cast<uint64_t>(State().latency)), false};
+}
+void World::SetPersonaNameArrives(uint64 steamId, const std::string& name, Delay delay)
+{
+    auto l = Lock();
+    State().personas[steamId] = Persona{name, Persona::Arrival::OnRequest, delay, false};
+}
+void World::SetPersonaNameNever(uint64 steamId)
+{
+    auto l = Lock();
+    State().personas[steamId] = Persona{"[unknown]", Persona::Arrival::Never, {}, false};
 }
 void World::SetFriends(std::vector<uint64> steamIds)
 {
@@ -301,6 +386,12 @@ std::vector<LeaderboardRow> World::LeaderboardRows(const std::string& name) cons
         if (b.name == name)
             return b.rows;
     return {};
+}
+
+std::size_t World::DownloadedEntrySets() const
+{
+    auto l = Lock();
+    return State().downloads.size();
 }
 
 void World::AddWorkshopItem(WorkshopItem item)

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
 #include <thread>
 
 namespace simclient {
@@ -14,11 +15,48 @@ WorldState& State()
     return *state;
 }
 
-void WorldState::Record(const char* name, std::string args)
+void WorldState::Record(CallName name, std::string args)
 {
     if (!journalEnabled.load(std::memory_order_relaxed))
         return;
-    journal.push_back(JournalEntry{name, std::move(args), std::this_thread::get_id()});
+    const std::thread::id thread = std::this_thread::get_id();
+    if (!journal.empty()) {
+        JournalEntry& last = journal.back();
+        if (last.thread == thread && last.name == name.text && last.args == args) {
+            ++last.count;
+            return;
+        }
+    }
+    journal.push_back(JournalEntry{name.text, std::move(args), thread});
+}
+
+void WorldData::PostNow(int callbackId, const void* data, std::size_t size)
+{
+    Pending p;
+    p.dueAtPump = pump;
+    p.callbackId = callbackId;
+    p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
+    queue.push_back(std::move(p));
+}
+
+std::vector<Scheduled> WorldState::TakeDueActions(bool haveTime)
+{
+    std::vector<Scheduled> due;
+    if (scheduled.empty())
+        return due;
+    auto isDue = [&](const Scheduled& a) {
+        return a.due.clock == Clock::Pump ? a.due.at <= pump : haveTime && a.due.at <= engineMs;
+    };
+    auto keep = std::stable_partition(scheduled.begin(), scheduled.end(),
+                                      [&](const Scheduled& a) { return !isDue(a); });
+    due.assign(std::make_move_iterator(keep), std::make_move_iterator(scheduled.end()));
+    scheduled.erase(keep, scheduled.end());
+    std::sort(due.begin(), due.end(), [](const Scheduled& a, const Scheduled& b) {
+        if (a.due.clock != b.due.clock)
+            return a.due.clock == Clock::Pump;
+        return a.due.at != b.due.at ? a.due.at < b.due.at : a.order < b.order;
+    });
+    return due;
 }
 
 AppliedFaults WorldState::TakeFaults(const std::string& call)
@@ -83,7 +121,7 @@ void WorldState::QueueCallback(int callbackId, const void* data, std::size_t siz
 }
 
 SteamAPICall_t WorldState::QueueCallResult(int callbackId, const void* data, std::size_t size,
-                                           const AppliedFaults& f)
+                                           const AppliedFaults& f, std::function<void()> afterDelivery)
 {
     if (f.zeroHandle)
         return k_uAPICallInvalid;
@@ -95,6 +133,7 @@ SteamAPICall_t WorldState::QueueCallResult(int callbackId, const void* data, std
     p.callbackId = callbackId;
     p.handle = handle;
     p.ioFailure = f.ioFailure;
+    p.afterDelivery = std::move(afterDelivery);
     p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
     queue.push_back(std::move(p));
     SyncQueuedCount();
@@ -103,49 +142,13 @@ SteamAPICall_t WorldState::QueueCallResult(int callbackId, const void* data, std
 
 void WorldState::ResetData()
 {
+    static_cast<WorldData&>(*this) = WorldData{};
     journalEnabled.store(true);
-    steamRunning = true;
-    initSucceeds = true;
-    initialised = false;
-    for (bool& a : available)
-        a = true;
-    userId = 76561197960265728ull + 1234;
-    loggedOn = true;
-    personaName = "Player";
-    appId = 480;
-    overlayEnabled = true;
-    serverTime = 1700000000;
-    notificationPosition.reset();
-    language = std::string("english");
-    beta.reset();
-    dlcs.clear();
-    warningHook = nullptr;
-    latency = 1;
-    pump = 0;
-    queue.clear();
+    ++journalEpoch;
+    std::atomic_store(&timeSource, std::shared_ptr<const std::function<uint64_t()>>());
+    std::atomic_store(&callObserver,
+                      std::shared_ptr<const std::function<void(const char*, const std::string&)>>());
     SyncQueuedCount();
-    faults.clear();
-    journal.clear();
-    stats.clear();
-    achievements.clear();
-    unlockedSinceStore.clear();
-    statsReceivedResult = statsStoredResult = k_EResultOK;
-    statsReceivedGameId = statsStoredGameId = 0;
-    files.clear();
-    cloudEnabledForApp.reset();
-    personas.clear();
-    friends.clear();
-    storeRequests.clear();
-    webRequests.clear();
-    leaderboards.clear();
-    downloads.clear();
-    items.clear();
-    queries.clear();
-    updates.clear();
-    updateStatus = k_EItemUpdateStatusInvalid;
-    updateProcessed = updateTotal = 0;
-    needsLegalAgreement = false;
-    submissions.clear();
     BumpGeneration();
 }
 

@@ -10,10 +10,13 @@
 #include <deque>
 #include <functional>
 #include <map>
+#include <memory>
 #include <mutex>
 #include <optional>
 #include <set>
 #include <string>
+#include <unordered_map>
+#include <unordered_set>
 #include <vector>
 
 #include "simclient/World.h"
@@ -27,7 +30,8 @@ struct Pending {
     SteamAPICall_t handle = k_uAPICallInvalid;  // 0: broadcast callback
     bool ioFailure = false;
     std::vector<uint8> payload;
-    std::function<void()> onDeliver;  // runs under the world lock just before delivery
+    std::function<void()> onDeliver;      // runs under the world lock just before delivery
+    std::function<void()> afterDelivery;  // runs under the world lock after it
 };
 
 // Faults that apply to one call, merged from everything queued for its kind.
@@ -46,7 +50,8 @@ struct Leaderboard {
     std::string name;
     ELeaderboardSortMethod sort = k_ELeaderboardSortMethodDescending;
     ELeaderboardDisplayType display = k_ELeaderboardDisplayTypeNumeric;
-    std::vector<LeaderboardRow> rows;  // kept in rank order
+    std::vector<LeaderboardRow> rows;           // kept in rank order
+    std::unordered_map<uint64, int32> scoreOf;  // user -> score of the user's row
 };
 
 struct DownloadedEntries {
@@ -64,15 +69,46 @@ struct ItemUpdate {
     WorkshopSubmission pending;
 };
 
-struct WorldState {
-    mutable std::mutex mutex;
+// The name of a journaled call, checked against kCallNames when compiled:
+//   CallScope call(SIM_CALL("FileRead"), Args(...));
+struct CallName {
+    const char* text;
+};
+template <int Index> constexpr CallName CheckedCallName()
+{
+    static_assert(Index >= 0, "a journaled call name is missing from kCallNames (CallNames.h)");
+    return CallName{kCallNames[Index].data()};
+}
+#define SIM_CALL(name) ::simclient::CheckedCallName<::simclient::CallIndex(name)>()
 
+// One scheduled change of the world (World::Schedule).
+struct Scheduled {
+    Due due;
+    uint64 order = 0;  // scheduling order, breaks ties between equal due points
+    WorldAction action;
+};
+
+// Another user's name and how it becomes known (World::SetPersonaName*).
+struct Persona {
+    enum class Arrival {
+        Known,
+        OnRequest,
+        Never
+    };
+    std::string name;
+    Arrival arrival = Arrival::Known;
+    Delay delay;             // OnRequest: from the first request to the name
+    bool lookingUp = false;  // OnRequest: a lookup is under way
+};
+
+// Everything Reset puts back, each default written once here: Reset assigns a fresh
+// WorldData. Scheduled actions receive it.
+struct WorldData {
     // Process
     bool steamRunning = true;
     bool initSucceeds = true;
     bool initialised = false;
     bool available[kInterfaceCount] = {true, true, true, true, true, true, true, true};
-    std::atomic<uintptr_t> generation{0};
 
     // User, app, utilities
     uint64 userId = 76561197960265728ull + 1234;
@@ -87,13 +123,13 @@ struct WorldState {
     std::vector<Dlc> dlcs;
     SteamAPIWarningMessageHook_t warningHook = nullptr;
 
-    // Dispatch
+    // Dispatch and schedule
     int latency = 1;
     uint64 pump = 0;
-    SteamAPICall_t nextHandle = 0x100;
+    uint64 engineMs = 0;  // engine time read at the latest pump
     std::deque<Pending> queue;
-    std::map<int, std::vector<CCallbackBase*>> callbacks;  // by number, in registration order
-    std::map<SteamAPICall_t, CCallbackBase*> callResults;
+    std::vector<Scheduled> scheduled;
+    uint64 nextScheduleOrder = 0;
 
     // Faults and journal
     std::map<std::string, std::vector<Fault>> faults;
@@ -113,43 +149,92 @@ struct WorldState {
     std::optional<bool> cloudEnabledForApp;
 
     // Friends
-    std::map<uint64, std::pair<std::string, bool>> personas;  // id -> (name, known)
+    std::map<uint64, Persona> personas;
     std::vector<uint64> friends;
     std::vector<std::pair<AppId_t, EOverlayToStoreFlag>> storeRequests;
     std::vector<std::pair<std::string, EActivateGameOverlayToWebPageMode>> webRequests;
 
     // Leaderboards
     std::vector<Leaderboard> leaderboards;  // handle = index + 1
+    // Entry sets of downloads whose result has not been handled yet; each is released
+    // once its call result has been dispatched.
     std::map<SteamLeaderboardEntries_t, DownloadedEntries> downloads;
-    SteamLeaderboardEntries_t nextEntriesHandle = 1;
 
     // Workshop
     std::map<PublishedFileId_t, WorkshopItem> items;
     std::map<UGCQueryHandle_t, UgcQuery> queries;
-    UGCQueryHandle_t nextQueryHandle = 1;
     std::map<UGCUpdateHandle_t, ItemUpdate> updates;
-    UGCUpdateHandle_t nextUpdateHandle = 1;
-    PublishedFileId_t nextItemId = 1000000;
     EItemUpdateStatus updateStatus = k_EItemUpdateStatusInvalid;
     uint64 updateProcessed = 0, updateTotal = 0;
     bool needsLegalAgreement = false;
     std::vector<WorkshopSubmission> submissions;
 
-    // --- helpers; all expect the mutex held ---
-    void BumpGeneration() { generation.fetch_add(1, std::memory_order_acq_rel); }
-    void Record(const char* name, std::string args);
+    // --- helpers for scheduled actions and the simulated methods ---
+    // The absolute point `delay` from now.
+    Due DueAfter(Delay delay) const
+    {
+        return delay.clock == Clock::Pump ? Due::Pump(pump + delay.amount)
+                                          : Due::EngineMs(engineMs + delay.amount);
+    }
+    void ScheduleAt(Due due, WorldAction action)
+    {
+        scheduled.push_back(Scheduled{due, nextScheduleOrder++, std::move(action)});
+    }
+    // Queues a broadcast callback for the current pump: from a scheduled action, it is
+    // delivered by the pump that ran the action.
+    void PostNow(int callbackId, const void* data, std::size_t size);
+    template <class T> void PostNow(const T& data) { PostNow(T::k_iCallback, &data, sizeof(T)); }
+};
+
+// The world: its data, plus what outlives a Reset.
+struct WorldState : WorldData {
+    mutable std::mutex mutex;
+    std::atomic<uintptr_t> generation{0};
     // Mirrors of state read without the lock by the idle pump's fast path.
     std::atomic<bool> journalEnabled{true};
-    std::atomic<std::size_t> queuedCount{0};
-    void SyncQueuedCount() { queuedCount.store(queue.size(), std::memory_order_release); }
+    std::atomic<std::size_t> queuedCount{0};  // queued deliveries plus scheduled actions
+    // Read by each pump before it takes the lock (std::atomic_load/atomic_store).
+    std::shared_ptr<const std::function<uint64_t()>> timeSource;
+    std::shared_ptr<const std::function<void(const char*, const std::string&)>> callObserver;
+    // Tells the observer of a call, then gives the mutex the call goes on to take.
+    std::mutex& Announce(CallName name, const std::string& args)
+    {
+        if (auto observer = std::atomic_load(&callObserver))
+            (*observer)(name.text, args);
+        return mutex;
+    }
+
+    // Kept by Reset (see World::Reset).
+    std::map<int, std::vector<CCallbackBase*>> callbacks;  // by number, in registration order
+    std::map<SteamAPICall_t, CCallbackBase*> callResults;
+    SteamAPICall_t nextHandle = 0x100;
+    SteamLeaderboardEntries_t nextEntriesHandle = 1;
+    UGCQueryHandle_t nextQueryHandle = 1;
+    UGCUpdateHandle_t nextUpdateHandle = 1;
+    PublishedFileId_t nextItemId = 1000000;
+    uint64 journalEpoch = 1;  // moves when the journal restarts, invalidating marks
+    // Every text handed to the code under test (names, language): pointers into it stay
+    // valid for the life of the process, as the platform's do, whatever later changes or
+    // resets the world. Never shrinks; holds each distinct text once.
+    std::unordered_set<std::string> texts;
+
+    // --- helpers; all expect the mutex held ---
+    void BumpGeneration() { generation.fetch_add(1, std::memory_order_acq_rel); }
+    // Journals a call, folding it into the previous entry when identical.
+    void Record(CallName name, std::string args);
+    void SyncQueuedCount() { queuedCount.store(queue.size() + scheduled.size(), std::memory_order_release); }
+    const char* Intern(const std::string& text) { return texts.insert(text).first->c_str(); }
     AppliedFaults TakeFaults(const std::string& call);
     // Queues a broadcast callback after the configured latency.
     void QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency = 0,
                        std::function<void()> onDeliver = {});
     // Allocates a handle and queues the result, honouring the faults; returns the handle
-    // (k_uAPICallInvalid under ZeroHandle).
+    // (k_uAPICallInvalid under ZeroHandle). `afterDelivery` runs under the lock once the
+    // result has been dispatched (its handler returned), or was found unbound.
     SteamAPICall_t QueueCallResult(int callbackId, const void* data, std::size_t size,
-                                   const AppliedFaults& faults);
+                                   const AppliedFaults& faults, std::function<void()> afterDelivery = {});
+    // Takes out the actions due at this pump, in running order.
+    std::vector<Scheduled> TakeDueActions(bool haveTime);
     bool Usable(Interface which) const { return initialised && available[int(which)]; }
     void ResetData();
 };
@@ -159,9 +244,9 @@ WorldState& State();
 // Locks the world, journals the call and collects its faults: the preamble of every
 // simulated SDK method.
 struct CallScope {
-    CallScope(const char* name, std::string args)
-        : state(State()), lock(state.mutex),
-          faults((state.Record(name, std::move(args)), state.TakeFaults(name)))
+    CallScope(CallName name, std::string args)
+        : state(State()), lock(state.Announce(name, args)),
+          faults((state.Record(name, std::move(args)), state.TakeFaults(name.text)))
     {
     }
     WorldState& state;

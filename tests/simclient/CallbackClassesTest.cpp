@@ -14,22 +14,33 @@ SteamAPICall_t StartFind(const char* name)
                                                      k_ELeaderboardDisplayTypeNumeric);
 }
 
-TEST_F(CallbackClasses, CallResultDeliversOnceAndClearsHandle)
+// Set, replace, cancel, destroy: only the latest live binding gets its result, once.
+TEST_F(CallbackClasses, CallResultBindingLifecycle)
 {
     Catch c;
     CCallResult<Catch, LeaderboardFindResult_t> result;
-    EXPECT_FALSE(result.IsActive());
-    SteamAPICall_t h = StartFind("board");
-    ASSERT_NE(h, k_uAPICallInvalid);
-    result.Set(h, &c, &Catch::OnResult);
+    result.Set(k_uAPICallInvalid, &c, &Catch::OnResult);
+    EXPECT_FALSE(result.IsActive()) << "a zero handle was bound";
+    world.InjectFault("FindOrCreateLeaderboard", simclient::Fault::IoFailure().Skip(1));
+    SteamAPICall_t replaced = StartFind("a");
+    result.Set(replaced, &c, &Catch::OnResult);
+    result.Set(StartFind("b"), &c, &Catch::OnResult);
     EXPECT_TRUE(result.IsActive());
     EXPECT_EQ(world.BoundCallResultCount(), 1u);
-
+    {
+        CCallResult<Catch, LeaderboardFindResult_t> cancelled, destroyed;
+        cancelled.Set(StartFind("c"), &c, &Catch::OnResult);
+        cancelled.Cancel();
+        EXPECT_FALSE(cancelled.IsActive());
+        destroyed.Set(StartFind("d"), &c, &Catch::OnResult);
+    }
+    EXPECT_EQ(world.BoundCallResultCount(), 1u);
     SteamAPI_RunCallbacks();
     EXPECT_EQ(c.calls, 1);
+    EXPECT_EQ(c.last.m_hSteamLeaderboard, 2u);  // board "b"
+    EXPECT_TRUE(c.lastIoFailure);
     EXPECT_FALSE(result.IsActive());
     EXPECT_EQ(world.BoundCallResultCount(), 0u);
-    EXPECT_TRUE(c.last.m_bLeaderboardFound);
     SteamAPI_RunCallbacks();
     EXPECT_EQ(c.calls, 1);
 }
@@ -59,56 +70,6 @@ TEST_F(CallbackClasses, HandleIsClearedBeforeHandlerSoItCanChain)
     EXPECT_EQ(chain.calls, 2);
 }
 
-TEST_F(CallbackClasses, SetReplacesPendingCallAndOldResultIsIgnored)
-{
-    Catch c;
-    CCallResult<Catch, LeaderboardFindResult_t> result;
-    SteamAPICall_t first = StartFind("a");
-    SteamAPICall_t second = StartFind("b");
-    result.Set(first, &c, &Catch::OnResult);
-    result.Set(second, &c, &Catch::OnResult);
-    EXPECT_EQ(world.BoundCallResultCount(), 1u);
-    SteamAPI_RunCallbacks();
-    EXPECT_EQ(c.calls, 1);
-    EXPECT_EQ(c.last.m_hSteamLeaderboard, 2u);  // board "b"
-}
-
-TEST_F(CallbackClasses, SetWithZeroHandleRegistersNothing)
-{
-    Catch c;
-    CCallResult<Catch, LeaderboardFindResult_t> result;
-    result.Set(k_uAPICallInvalid, &c, &Catch::OnResult);
-    EXPECT_FALSE(result.IsActive());
-    EXPECT_EQ(world.BoundCallResultCount(), 0u);
-}
-
-TEST_F(CallbackClasses, CancelAndDestructorDropTheBinding)
-{
-    Catch c;
-    {
-        CCallResult<Catch, LeaderboardFindResult_t> result;
-        result.Set(StartFind("a"), &c, &Catch::OnResult);
-        result.Cancel();
-        EXPECT_FALSE(result.IsActive());
-        EXPECT_EQ(world.BoundCallResultCount(), 0u);
-        result.Set(StartFind("b"), &c, &Catch::OnResult);
-    }
-    EXPECT_EQ(world.BoundCallResultCount(), 0u);
-    SteamAPI_RunCallbacks();
-    EXPECT_EQ(c.calls, 0);
-}
-
-TEST_F(CallbackClasses, IoFailureFlagReachesHandler)
-{
-    world.InjectFault("FindOrCreateLeaderboard", simclient::Fault::IoFailure());
-    Catch c;
-    CCallResult<Catch, LeaderboardFindResult_t> result;
-    result.Set(StartFind("a"), &c, &Catch::OnResult);
-    SteamAPI_RunCallbacks();
-    ASSERT_EQ(c.calls, 1);
-    EXPECT_TRUE(c.lastIoFailure);
-}
-
 // A delivery through the three-argument Run with a foreign handle must be ignored.
 TEST_F(CallbackClasses, ForeignHandleIsIgnored)
 {
@@ -128,33 +89,28 @@ TEST_F(CallbackClasses, ForeignHandleIsIgnored)
     EXPECT_EQ(base.GetICallback(), LeaderboardFindResult_t::k_iCallback);
 }
 
-TEST_F(CallbackClasses, CallbackRegistersOnConstructionAndUnregistersOnDestruction)
+// Registration follows the object's life, without duplicates; game-server objects get
+// nothing from the client.
+TEST_F(CallbackClasses, CallbackRegistrationFollowsTheObject)
 {
     using OverlayCatch = Catcher<GameOverlayActivated_t>;
-    OverlayCatch c;
+    OverlayCatch c, server;
     const int id = GameOverlayActivated_t::k_iCallback;
     const int before = world.RegisteredCallbackCount(id);
+    CCallback<OverlayCatch, GameOverlayActivated_t, true> serverCallback(&server, &OverlayCatch::OnCallback);
     {
         CCallback<OverlayCatch, GameOverlayActivated_t> cb(&c, &OverlayCatch::OnCallback);
-        EXPECT_EQ(world.RegisteredCallbackCount(id), before + 1);
+        EXPECT_EQ(world.RegisteredCallbackCount(id), before + 2);
         cb.Register(&c, &OverlayCatch::OnCallback);  // re-register must not duplicate
-        EXPECT_EQ(world.RegisteredCallbackCount(id), before + 1);
+        EXPECT_EQ(world.RegisteredCallbackCount(id), before + 2);
+        world.SetOverlayActive(true);
+        SteamAPI_RunCallbacks();
         cb.Unregister();
-        EXPECT_EQ(world.RegisteredCallbackCount(id), before);
+        EXPECT_EQ(world.RegisteredCallbackCount(id), before + 1);
         cb.Register(&c, &OverlayCatch::OnCallback);
     }
-    EXPECT_EQ(world.RegisteredCallbackCount(id), before);
-}
-
-TEST_F(CallbackClasses, GameServerCallbacksDoNotGetClientCallbacks)
-{
-    using OverlayCatch = Catcher<GameOverlayActivated_t>;
-    OverlayCatch client, server;
-    CCallback<OverlayCatch, GameOverlayActivated_t> c1(&client, &OverlayCatch::OnCallback);
-    CCallback<OverlayCatch, GameOverlayActivated_t, true> c2(&server, &OverlayCatch::OnCallback);
-    world.SetOverlayActive(true);
-    SteamAPI_RunCallbacks();
-    EXPECT_EQ(client.calls, 1);
+    EXPECT_EQ(world.RegisteredCallbackCount(id), before + 1);
+    EXPECT_EQ(c.calls, 1);
     EXPECT_EQ(server.calls, 0);
 }
 

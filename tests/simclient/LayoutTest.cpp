@@ -1,4 +1,5 @@
-// Record layouts must match the platform's 4-byte callback packing on this OS.
+// Record layouts must match the platform's 4-byte callback packing on this OS, and the
+// callback numbers the platform's; all checked when compiled.
 #include <cstddef>
 
 #include <gtest/gtest.h>
@@ -51,22 +52,20 @@ CHECK_OFFSET(SteamUGCDetails_t, m_unNumChildren, 9760);
 CHECK_SIZE(RemoteStorageSubscribePublishedFileResult_t, 12);
 CHECK_SIZE(PersonaStateChange_t, 12);
 
-TEST(Layout, CallbackNumbers)
-{
-    EXPECT_EQ(GameOverlayActivated_t::k_iCallback, 331);
-    EXPECT_EQ(PersonaStateChange_t::k_iCallback, 304);
-    EXPECT_EQ(UserStatsReceived_t::k_iCallback, 1101);
-    EXPECT_EQ(UserStatsStored_t::k_iCallback, 1102);
-    EXPECT_EQ(UserAchievementStored_t::k_iCallback, 1103);
-    EXPECT_EQ(LeaderboardFindResult_t::k_iCallback, 1104);
-    EXPECT_EQ(LeaderboardScoresDownloaded_t::k_iCallback, 1105);
-    EXPECT_EQ(LeaderboardScoreUploaded_t::k_iCallback, 1106);
-    EXPECT_EQ(RemoteStorageSubscribePublishedFileResult_t::k_iCallback, 1313);
-    EXPECT_EQ(RemoteStorageUnsubscribePublishedFileResult_t::k_iCallback, 1315);
-    EXPECT_EQ(SteamUGCQueryCompleted_t::k_iCallback, 3401);
-    EXPECT_EQ(CreateItemResult_t::k_iCallback, 3403);
-    EXPECT_EQ(SubmitItemUpdateResult_t::k_iCallback, 3404);
-}
+#define CHECK_NUMBER(T, n) static_assert(T::k_iCallback == (n), #T " callback number")
+CHECK_NUMBER(GameOverlayActivated_t, 331);
+CHECK_NUMBER(PersonaStateChange_t, 304);
+CHECK_NUMBER(UserStatsReceived_t, 1101);
+CHECK_NUMBER(UserStatsStored_t, 1102);
+CHECK_NUMBER(UserAchievementStored_t, 1103);
+CHECK_NUMBER(LeaderboardFindResult_t, 1104);
+CHECK_NUMBER(LeaderboardScoresDownloaded_t, 1105);
+CHECK_NUMBER(LeaderboardScoreUploaded_t, 1106);
+CHECK_NUMBER(RemoteStorageSubscribePublishedFileResult_t, 1313);
+CHECK_NUMBER(RemoteStorageUnsubscribePublishedFileResult_t, 1315);
+CHECK_NUMBER(SteamUGCQueryCompleted_t, 3401);
+CHECK_NUMBER(CreateItemResult_t, 3403);
+CHECK_NUMBER(SubmitItemUpdateResult_t, 3404);
 
 TEST(Layout, SteamIdBitFields)
 {

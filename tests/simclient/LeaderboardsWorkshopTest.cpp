@@ -1,65 +1,120 @@
 // Leaderboard ranking/upload rules and the workshop item round trip.
+#include <algorithm>
+#include <iterator>
+#include <string>
+
 #include "SimFixture.h"
 
 namespace {
 
 class LeaderboardsWorkshop : public SimWorld {
 protected:
-    template <class P> P Await(SteamAPICall_t h)
-    {
-        using Catch = Catcher<P>;
-        Catch c;
-        CCallResult<Catch, P> result;
-        result.Set(h, &c, &Catch::OnResult);
-        SteamAPI_RunCallbacks();
-        EXPECT_EQ(c.calls, 1);
-        return c.last;
-    }
     uint64 Id(uint32 account) { return 76561197960265728ull + account; }
+};
+
+// Reads a downloaded set inside its handler, where it is readable.
+struct EntryReader {
+    std::vector<int> scores;
+    SteamLeaderboardEntries_t set = 0;
+    void OnResult(LeaderboardScoresDownloaded_t* d, bool)
+    {
+        set = d->m_hSteamLeaderboardEntries;
+        for (int i = 0; i < d->m_cEntryCount; ++i) {
+            LeaderboardEntry_t e{};
+            int32 details[2] = {};
+            EXPECT_TRUE(SteamUserStats()->GetDownloadedLeaderboardEntry(set, i, &e, details, 2));
+            scores.push_back(e.m_nScore);
+            if (e.m_nScore == 50) {  // the best row of the board
+                EXPECT_EQ(e.m_nGlobalRank, 1);
+                EXPECT_EQ(details[0], 7);
+            }
+        }
+    }
 };
 
 TEST_F(LeaderboardsWorkshop, DownloadRanges)
 {
     world.SetLocalUser(Id(3), true, "Me");
-    world.SetFriends({Id(1)});
+    world.SetFriends({Id(1), Id(1), Id(42)});
     world.AddLeaderboard("hi", k_ELeaderboardSortMethodDescending, k_ELeaderboardDisplayTypeNumeric,
                          {{Id(1), 10, {}}, {Id(2), 50, {7}}, {Id(3), 30, {}}, {Id(4), 20, {}}});
     ISteamUserStats* us = SteamUserStats();
     auto found = Await<LeaderboardFindResult_t>(
         us->FindOrCreateLeaderboard("hi", k_ELeaderboardSortMethodNone, k_ELeaderboardDisplayTypeNone));
     ASSERT_TRUE(found.m_bLeaderboardFound);
+    const SteamLeaderboard_t board = found.m_hSteamLeaderboard;
+    CSteamID users[] = {CSteamID(Id(1)), CSteamID(Id(2)), CSteamID(Id(1)), CSteamID(Id(99))};
     struct Row {
         const char* name;
-        ELeaderboardDataRequest req;
-        int start, end;
+        SteamAPICall_t call;
         std::vector<int> scores;
     };
     const Row rows[] = {
-        {"global top two", k_ELeaderboardDataRequestGlobal, 1, 2, {50, 30}},
-        {"global clamps", k_ELeaderboardDataRequestGlobal, 0, 99, {50, 30, 20, 10}},
-        {"around user", k_ELeaderboardDataRequestGlobalAroundUser, -1, 1, {50, 30, 20}},
-        {"friends and me", k_ELeaderboardDataRequestFriends, 0, 0, {30, 10}},
+        {"global top two",
+         us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 1, 2),
+         {50, 30}},
+        {"global clamps",
+         us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 0, 99),
+         {50, 30, 20, 10}},
+        {"around user",
+         us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobalAroundUser, -1, 1),
+         {50, 30, 20}},
+        {"friends and me, once each",
+         us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestFriends, 0, 0),
+         {30, 10}},
+        {"given users by rank, once each", us->DownloadLeaderboardEntriesForUsers(board, users, 4), {50, 10}},
     };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.name);
-        auto d = Await<LeaderboardScoresDownloaded_t>(
-            us->DownloadLeaderboardEntries(found.m_hSteamLeaderboard, row.req, row.start, row.end));
-        ASSERT_EQ(d.m_cEntryCount, int(row.scores.size()));
-        for (int i = 0; i < d.m_cEntryCount; ++i) {
-            LeaderboardEntry_t e{};
-            int32 details[2] = {};
-            ASSERT_TRUE(us->GetDownloadedLeaderboardEntry(d.m_hSteamLeaderboardEntries, i, &e, details, 2));
-            EXPECT_EQ(e.m_nScore, row.scores[size_t(i)]);
-            if (e.m_nScore == 50) {
-                EXPECT_EQ(e.m_nGlobalRank, 1);
-                EXPECT_EQ(details[0], 7);
-            }
-        }
+    constexpr std::size_t kRows = std::size(rows);
+    EntryReader readers[kRows];
+    CCallResult<EntryReader, LeaderboardScoresDownloaded_t> results[kRows];
+    for (std::size_t i = 0; i < kRows; ++i)
+        results[i].Set(rows[i].call, &readers[i], &EntryReader::OnResult);
+    EXPECT_EQ(world.DownloadedEntrySets(), kRows);  // each held until its result is handled
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(world.DownloadedEntrySets(), 0u);
+    for (std::size_t i = 0; i < kRows; ++i) {
+        SCOPED_TRACE(rows[i].name);
+        EXPECT_EQ(readers[i].scores, rows[i].scores);
+        LeaderboardEntry_t e{};
+        EXPECT_FALSE(us->GetDownloadedLeaderboardEntry(readers[i].set, 0, &e, nullptr, 0))
+            << "kept after the handler";
     }
-    CSteamID users[] = {CSteamID(Id(4))};
-    auto d = Await<LeaderboardScoresDownloaded_t>(
-        us->DownloadLeaderboardEntriesForUsers(found.m_hSteamLeaderboard, users, 1));
-    EXPECT_EQ(d.m_cEntryCount, 1);
+}
+
+TEST_F(LeaderboardsWorkshop, DownloadedSetsAreReleased)
+{
+    world.AddLeaderboard("b", k_ELeaderboardSortMethodDescending, k_ELeaderboardDisplayTypeNumeric,
+                         {{Id(1), 10, {}}});
+    ISteamUserStats* us = SteamUserStats();
+    for (int i = 0; i < 10000; ++i)
+        Await<LeaderboardScoresDownloaded_t>(
+            us->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestGlobal, 1, 1));
+    us->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestGlobal, 1, 1);  // nobody bound: released too
+    world.InjectFault("DownloadLeaderboardEntries", simclient::Fault::Drop());
+    us->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestGlobal, 1, 1);  // never answered: never kept
+    SteamAPI_RunCallbacks();
+    EXPECT_EQ(world.DownloadedEntrySets(), 0u);
+    us->DownloadLeaderboardEntries(1, k_ELeaderboardDataRequestGlobal, 1, 1);
+    world.Reset();
+    EXPECT_EQ(world.DownloadedEntrySets(), 0u);
+}
+
+// Names handed out stay readable while the boards they came from move in memory.
+TEST_F(LeaderboardsWorkshop, NamePointersOutliveGrowthAndReset)
+{
+    world.AddLeaderboard("first", k_ELeaderboardSortMethodDescending, k_ELeaderboardDisplayTypeNumeric);
+    const char* name = SteamUserStats()->GetLeaderboardName(1);
+    for (int i = 0; i < 100; ++i)
+        SteamUserStats()->FindOrCreateLeaderboard(("grow" + std::to_string(i)).c_str(),
+                                                  k_ELeaderboardSortMethodAscending,
+                                                  k_ELeaderboardDisplayTypeNumeric);
+    EXPECT_STREQ(name, "first");
+    world.SetPersonaName(Id(5), "Before");
+    const char* persona = SteamFriends()->GetFriendPersonaName(CSteamID(Id(5)));
+    world.SetPersonaName(Id(5), "After");
+    world.Reset();
+    EXPECT_STREQ(name, "first");
+    EXPECT_STREQ(persona, "Before");
 }
 
 TEST_F(LeaderboardsWorkshop, UploadKeepBestAndForce)
@@ -79,6 +134,7 @@ TEST_F(LeaderboardsWorkshop, UploadKeepBestAndForce)
         {"first score", k_ELeaderboardUploadScoreMethodKeepBest, 120, true, 2},
         {"worse kept", k_ELeaderboardUploadScoreMethodKeepBest, 130, false, 2},
         {"better taken", k_ELeaderboardUploadScoreMethodKeepBest, 90, true, 1},
+        {"a tie goes after the earlier row", k_ELeaderboardUploadScoreMethodForceUpdate, 100, true, 2},
         {"forced worse", k_ELeaderboardUploadScoreMethodForceUpdate, 200, true, 2},
     };
     for (const Row& row : rows) {
@@ -95,6 +151,44 @@ TEST_F(LeaderboardsWorkshop, UploadKeepBestAndForce)
             us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodForceUpdate, 1, nullptr, 0))
             .m_bSuccess);
     EXPECT_EQ(world.LeaderboardRows("lo")[1].score, 200);
+}
+
+// Many users uploading few distinct scores: ranks and order must follow the rule
+// "better first, equal scores in the order they were set", checked against a plain model.
+TEST_F(LeaderboardsWorkshop, UploadsFollowTheRankRuleUnderManyTies)
+{
+    world.AddLeaderboard("t", k_ELeaderboardSortMethodDescending, k_ELeaderboardDisplayTypeNumeric);
+    struct ModelRow {
+        uint64 user;
+        int score;
+    };
+    std::vector<ModelRow> model;  // in rank order
+    uint32 seed = 12345;
+    auto next = [&](uint32 n) { return (seed = seed * 1103515245u + 12345u) / 65536u % n; };
+    for (int i = 0; i < 300; ++i) {
+        const uint64 user = Id(next(40));
+        const int score = static_cast<int>(next(8));
+        const bool force = next(2) == 0;
+        world.SetLocalUser(user, true, "U");
+        auto up = Await<LeaderboardScoreUploaded_t>(SteamUserStats()->UploadLeaderboardScore(
+            1, force ? k_ELeaderboardUploadScoreMethodForceUpdate : k_ELeaderboardUploadScoreMethodKeepBest,
+            score, nullptr, 0));
+        auto mine =
+            std::find_if(model.begin(), model.end(), [&](const ModelRow& r) { return r.user == user; });
+        ASSERT_EQ(up.m_nGlobalRankPrevious, mine == model.end() ? 0 : int(mine - model.begin()) + 1);
+        if (mine == model.end() || force || score > mine->score) {
+            if (mine != model.end())
+                model.erase(mine);
+            auto at =
+                std::find_if(model.begin(), model.end(), [&](const ModelRow& r) { return r.score < score; });
+            mine = model.insert(at, ModelRow{user, score});
+        }
+        ASSERT_EQ(up.m_nGlobalRankNew, int(mine - model.begin()) + 1) << "upload " << i;
+    }
+    std::vector<simclient::LeaderboardRow> rows = world.LeaderboardRows("t");
+    ASSERT_EQ(rows.size(), model.size());
+    for (std::size_t i = 0; i < rows.size(); ++i)
+        EXPECT_EQ(rows[i].steamId, model[i].user) << "row " << i;
 }
 
 TEST_F(LeaderboardsWorkshop, WorkshopSubscriptionsAndInstallInfo)

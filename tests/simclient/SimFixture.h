@@ -2,6 +2,8 @@
 #ifndef TESTS_SIMCLIENT_SIM_FIXTURE_H
 #define TESTS_SIMCLIENT_SIM_FIXTURE_H
 
+#include <functional>
+
 #include <gtest/gtest.h>
 #include <steam/steam_api.h>
 
@@ -16,6 +18,29 @@ protected:
         world.ClearJournal();
     }
     void TearDown() override { world.Reset(); }
+
+    // Binds the result of `call`, pumps once and returns what the handler got; `inside`
+    // runs within the handler (where downloaded entries are readable).
+    template <class P> P Await(SteamAPICall_t call, std::function<void(const P&)> inside = {})
+    {
+        struct Handler {
+            std::function<void(const P&)> inside;
+            int calls = 0;
+            P last{};
+            void OnResult(P* p, bool)
+            {
+                ++calls;
+                last = *p;
+                if (inside)
+                    inside(*p);
+            }
+        } handler{std::move(inside)};
+        CCallResult<Handler, P> result;
+        result.Set(call, &handler, &Handler::OnResult);
+        SteamAPI_RunCallbacks();
+        EXPECT_EQ(handler.calls, 1);
+        return handler.last;
+    }
 
     simclient::World& world = simclient::GetWorld();
 };

@@ -7,6 +7,7 @@
 #define SIMCLIENT_WORLD_H
 
 #include <cstdint>
+#include <functional>
 #include <optional>
 #include <string>
 #include <utility>
@@ -14,10 +15,16 @@
 
 #include <steam/steam_api.h>
 
+#include "simclient/CallNames.h"
 #include "simclient/Fault.h"
 #include "simclient/Journal.h"
+#include "simclient/Schedule.h"
 
 namespace simclient {
+
+// The world's data (src/WorldState.h), handed to scheduled actions.
+struct WorldData;
+using WorldAction = std::function<void(WorldData&)>;
 
 enum class Interface {
     Client,
@@ -77,9 +84,12 @@ struct WorkshopSubmission {
 class World {
 public:
     // Back to a fresh world: not initialised, Steam running, Init succeeding, every interface
-    // available, default user/app, no data, no faults, empty journal and queue, latency 1.
+    // available, default user/app, no data, no faults, empty journal and queue, latency 1,
+    // nothing scheduled, no time source, pump count 0.
     // Kept: callback registrations (they belong to objects still alive, e.g. a module's
-    // static overlay callback) and call-result bindings, whose handles simply never complete.
+    // static overlay callback) and call-result bindings, whose handles simply never
+    // complete; handle counters (an old handle never names a new object); and every text
+    // the client handed out (a module may still hold the pointer).
     void Reset();
 
     // --- Process and interfaces ------------------------------------------------------------
@@ -116,13 +126,51 @@ public:
     int RegisteredCallbackCount(int callbackId) const;
     std::size_t BoundCallResultCount() const;
 
+    // --- Changes that happen by themselves -----------------------------------------------------
+    // Runs `action` on the world's data at `due`, inside SteamAPI_RunCallbacks, under the
+    // world's lock and before that pump's deliveries (a callback it posts with
+    // WorldData::PostNow arrives in that same pump). Actions due at one pump run
+    // pump-clocked first, then engine-clocked, each by due point, then in the order they
+    // were scheduled. An action must not call the World or the SDK (the lock is held).
+    // A due point already passed fires at the next pump; Reset drops what is scheduled.
+    // WorldData is declared in the library's src/WorldState.h (include it to write an
+    // action; the library's own timed behaviours are built the same way). Example:
+    //   world.Schedule(Due::Pump(5), [](WorldData& d) { d.serverTime += 60; });
+    void Schedule(Due due, WorldAction action);
+    // The same, `delay` from now: After(Delay::Pumps(2), a) fires at PumpCount() + 2.
+    void After(Delay delay, WorldAction action);
+    std::size_t ScheduledCount() const;  // actions not run yet
+    // Where engine time comes from: called once per pump, outside the world's lock, by
+    // the thread that pumps (so it must be safe to call from there). Installed by whoever
+    // owns the clock (the scenario runner, a module test's engine); an empty function
+    // removes it. Without one, engine-clocked actions never fire and engine time reads 0.
+    void SetTimeSource(std::function<uint64_t()> nowMs);
+    // Told of every platform call as it is made, repeats folded in the journal included:
+    // called on the calling thread before the call takes the world's lock, so it may do
+    // anything but call the platform. For a runner that watches which threads only poll.
+    // An empty function removes it; Reset removes it too.
+    void SetCallObserver(std::function<void(const char* name, const std::string& args)> observer);
+
     // --- Faults ------------------------------------------------------------------------------
-    // `call` is the method name as journaled, e.g. "FileRead", "SteamAPI_Init".
+    // `call` is the method name as journaled, e.g. "FileRead", "SteamAPI_Init" (the names
+    // are in CallNames.h). An unknown name throws std::invalid_argument naming it and
+    // listing the known names.
     void InjectFault(const std::string& call, Fault fault);
     void ClearFaults();
 
     // --- Journal and warnings ----------------------------------------------------------------
+    // The whole journal (a copy).
     Journal GetJournal() const;
+    // A cursor for reading the journal as it grows without copying it all each time:
+    //   JournalMark mark = world.JournalMark();
+    //   ... calls happen ...
+    //   Journal fresh = world.JournalSince(mark);  // entries after the mark; mark moves to the end
+    // Folding may add repeats to the last entry after it was read: JournalSince then
+    // gives that entry again first, with `count` set to the repeats made since (so adding
+    // up the counts of everything read gives every call exactly once). A mark taken
+    // before ClearJournal or Reset reads the new journal from its start.
+    simclient::JournalMark JournalMark() const;
+    Journal JournalSince(simclient::JournalMark& mark) const;
     void ClearJournal();
     // Off: calls are not journaled, and an idle pump returns without taking the world's
     // lock (for benchmarks of the module's own overhead). Reset turns it back on.
@@ -146,8 +194,21 @@ public:
     std::optional<bool> CloudEnabledForApp() const;  // last SetCloudEnabledForApp, if any
 
     // --- Friends and overlay requests --------------------------------------------------------
-    // `known` false: RequestUserInformation returns true and the name arrives later.
+    // How another user's name becomes known, as the platform looks it up:
+    // - known now: GetFriendPersonaName gives it, RequestUserInformation answers false.
+    // - arrives: until known, GetFriendPersonaName gives "[unknown]" and
+    //   RequestUserInformation answers true; the first such request starts one lookup
+    //   that ends `delay` later (pumps or engine ms, plus any ExtraLatency fault of that
+    //   request): the name becomes known and one PersonaStateChange_t (k_EPersonaChangeName)
+    //   is delivered in that pump. Requests while the lookup runs add nothing.
+    // - never: "[unknown]" and true forever, and nothing is ever queued.
+    // An id the world has no entry for behaves as SetPersonaNameArrives(id, "[unknown]",
+    // the latency): one callback, then the request answers false and the name stays
+    // "[unknown]". The local user's name is SetLocalUser's.
+    // `known` false is SetPersonaNameArrives with Delay::Pumps(latency).
     void SetPersonaName(uint64 steamId, const std::string& name, bool known = true);
+    void SetPersonaNameArrives(uint64 steamId, const std::string& name, Delay delay);
+    void SetPersonaNameNever(uint64 steamId);
     void SetFriends(std::vector<uint64> steamIds);
     std::vector<std::pair<AppId_t, EOverlayToStoreFlag>> StoreOverlayRequests() const;
     std::vector<std::pair<std::string, EActivateGameOverlayToWebPageMode>> WebPageRequests() const;
@@ -156,8 +217,12 @@ public:
     void AddLeaderboard(const std::string& name, ELeaderboardSortMethod sort, ELeaderboardDisplayType display,
                         std::vector<LeaderboardRow> rows = {});
     bool HasLeaderboard(const std::string& name) const;
-    // Rows in rank order (best first).
+    // Rows in rank order: best first, equal scores in the order they were set (rows given
+    // to AddLeaderboard keep their order among equals; an upload goes after its equals).
     std::vector<LeaderboardRow> LeaderboardRows(const std::string& name) const;
+    // Downloaded entry sets still held: a set lives from the download call until its
+    // result has been dispatched (the handler is the one place to read it).
+    std::size_t DownloadedEntrySets() const;
 
     // --- Workshop ------------------------------------------------------------------------------
     void AddWorkshopItem(WorkshopItem item);

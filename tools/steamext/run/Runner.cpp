@@ -38,8 +38,21 @@ public:
         world_.Reset();
         for (const auto& edit : scenario_.world)
             edit.apply(world_);
+        platformMark_ = world_.JournalMark();
         EngineSession engine(scenario_.engine);
         engine_ = &engine;
+        // The client's scheduled changes in engine time follow this engine's clock.
+        world_.SetTimeSource([&engine] { return uint64_t{engine.NowMs()}; });
+        // The module's threads that only poll the platform count as settled (EngineSession.h).
+        world_.SetCallObserver(&EngineSession::NotePlatformCall);
+        struct ClientRelease {
+            simclient::World& world;
+            ~ClientRelease()
+            {
+                world.SetTimeSource({});
+                world.SetCallObserver({});
+            }
+        } clientRelease{world_};
         mainThread_ = std::this_thread::get_id();
 
         timeline_.Begin(scenario_.name, scenario_.description, options_.modulePath);
@@ -232,14 +245,17 @@ private:
     void Gather()
     {
         const Moment now = Now();
-        simclient::Journal journal = world_.GetJournal();
-        const auto& entries = journal.Entries();
-        for (; platformSeen_ < entries.size(); ++platformSeen_) {
-            const auto& entry = entries[platformSeen_];
-            Publish(now, json{{"kind", "platform_call"},
-                              {"name", entry.name},
-                              {"args", entry.args},
-                              {"thread", ThreadLabel(entry.thread)}});
+        // Only what is new: a call repeated in a row since the last gathering comes back
+        // as one record with its count.
+        const simclient::Journal fresh = world_.JournalSince(platformMark_);
+        for (const auto& entry : fresh.Entries()) {
+            json record{{"kind", "platform_call"},
+                        {"name", entry.name},
+                        {"args", entry.args},
+                        {"thread", ThreadLabel(entry.thread)}};
+            if (entry.count > 1)
+                record["count"] = entry.count;
+            Publish(now, record);
         }
         for (auto& record : engine_->TakeRecords())
             Publish(now, record);
@@ -255,7 +271,7 @@ private:
         else if (kind == "log" && record.value("level", 0) >= 2)
             ++summary_.errors;
         else if (kind == "platform_call")
-            ++summary_.platformCalls;
+            summary_.platformCalls += record.value("count", std::size_t{1});
         stepRecords_.push_back(record);
         timeline_.Record(at, record);
         if (kind == "engine_fault")
@@ -290,7 +306,7 @@ private:
     CallTarget target_;
     uint64_t frame_ = 0;
     std::size_t currentStep_ = 0;
-    std::size_t platformSeen_ = 0;
+    simclient::JournalMark platformMark_;
     std::thread::id mainThread_;
     std::map<std::thread::id, std::string> otherThreads_;
     std::vector<json> stepRecords_;

@@ -120,6 +120,9 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
         if (!entry.contains("call") || !entry.contains("kind"))
             r.Fail(at, "a fault needs \"call\" (the platform call's name) and \"kind\"");
         std::string call = r.String(entry["call"], ScenarioFile::Child(at, "call"));
+        if (simclient::CallIndex(call) < 0)
+            r.Fail(ScenarioFile::Child(at, "call"),
+                   "unknown platform call \"" + call + "\"; known calls: " + simclient::KnownCallList());
         std::string kindName = r.String(entry["kind"], ScenarioFile::Child(at, "kind"));
         const FaultKind* kind = nullptr;
         for (const auto& candidate : kFaultKinds)
