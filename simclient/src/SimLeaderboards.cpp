@@ -151,6 +151,7 @@ SteamAPICall_t SimSteamUserStats::DownloadLeaderboardEntriesForUsers(SteamLeader
     if (!board || cUsers < 0 || cUsers > 100 || (cUsers > 0 && !prgUsers))
         return k_uAPICallInvalid;
     std::vector<uint64> users;
+    users.reserve(static_cast<std::size_t>(cUsers));
     for (int u = 0; u < cUsers; ++u)
         users.push_back(prgUsers[u].ConvertToUint64());
     return PostDownload(s, call.faults, board, handle, RowsOfUsers(*board, std::move(users)));

@@ -248,7 +248,7 @@ void XmlReader::ReportParseError(const char* reason, int character)
     active = false;
     // The character goes out as a plain (signed) char promoted to int, so a byte
     // above 127 prints in hex as a negative number would, e.g. ffffffe9.
-    const int promoted = static_cast<signed char>(character);
+    const int promoted = static_cast<signed char>(character);  // NOLINT(bugprone-signed-char-misuse)
     HostReportError(1,
                     "Parsing error (%s) around line %d in XML '%s'. Unexpected character '%c' (%x) at:\n'%s'",
                     reason, line, path, promoted, static_cast<unsigned>(promoted), excerpt);

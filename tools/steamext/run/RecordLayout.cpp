@@ -47,7 +47,7 @@ void EncodeField(const RecordField& field, const json& value, RecordBuffer& reco
         if (text.size() >= field.count || text.find('\0') != std::string::npos)
             file.Fail(at, "the text is " + std::to_string(text.size()) + " bytes; the field holds at most " +
                               std::to_string(field.count - 1) + ", without zero bytes");
-        std::memcpy(place, text.data(), text.size());
+        std::memcpy(place, text.c_str(), text.size() + 1);  // with its terminating zero
         break;
     }
     case FieldKind::Int32:

@@ -129,8 +129,11 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
             kind = kindName == candidate.key ? &candidate : kind;
         if (kind == nullptr) {
             std::string list;
-            for (const auto& candidate : kFaultKinds)
-                list += std::string(list.empty() ? "" : ", ") + candidate.key;
+            for (const auto& candidate : kFaultKinds) {
+                if (!list.empty())
+                    list += ", ";
+                list += candidate.key;
+            }
             r.Fail(ScenarioFile::Child(at, "kind"),
                    "unknown fault kind \"" + kindName + "\"; expected one of: " + list);
         }
