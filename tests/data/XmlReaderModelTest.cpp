@@ -423,9 +423,9 @@ Trace RunModel(const std::string& body)
 std::string RandomBody(std::mt19937& random)
 {
     static const char* const kPieces[] = {
-        "<",    ">",   "/",  "=",  "\"",   "!", "-",      "\\",    "a",         "b",   "1",
-        " ",    "\n",  "\t", "\r", "&",    "?", "<!--",   "-->",   "<![CDATA[", "]]>", "<a ",
-        "b=\"", "\" ", "</", "/>", "\xe9", "x", "&quot;", "&amp;", "\\\"",      "\\\\"};
+        "<",  ">",  "/",    "=", "\"",     "!",     "-",    "\\",        "a",   "b",   "1",    " ",
+        "\n", "\t", "\r",   "&", "?",      "<!--",  "-->",  "<![CDATA[", "]]>", "<a ", "b=\"", "\" ",
+        "</", "/>", "\xe9", "x", "&quot;", "&amp;", "\\\"", "\\\\",      "\\n", "\\t", "\\r"};
     constexpr unsigned kPieceCount = sizeof kPieces / sizeof *kPieces;
     std::string body = kDeclaration;
     const unsigned length = random() % 40;
