@@ -59,11 +59,11 @@ simengine::Engine& FreshEngine()
     return engine;
 }
 
-Load LoadFile(const std::string& bytes, std::vector<std::optional<std::string>> answers = {})
+Load LoadFile(const std::string& bytes, const std::vector<std::optional<std::string>>& answers = {})
 {
     simengine::Engine& engine = FreshEngine();
     engine.Files().AddMemoryFile(kPath, bytes);
-    for (auto& answer : answers)
+    for (const auto& answer : answers)
         engine.Commands().QueuePopupAnswer(answer);
     Database database;
     Load result;

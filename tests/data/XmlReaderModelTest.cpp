@@ -65,7 +65,7 @@ struct ReaderModel {
                 ++line;
         cursor = size;
         active = false;
-        int p = (signed char)ch;
+        const int p = ch < 128 ? ch : ch - 256;  // a plain char, promoted as the reader's is
         char buf[70000];
         snprintf(buf, sizeof buf,
                  "Parsing error (%s) around line %d in XML '%s'. Unexpected character '%c' (%x) at:\n'%s'",

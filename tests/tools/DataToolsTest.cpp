@@ -237,64 +237,50 @@ TEST_F(DataTools, ScrambleRoundTripLoadsAsThePlainFile)
     EXPECT_EQ(wrapped["reports"], Json::array());
 }
 
-TEST_F(DataTools, UnscrambleRefusesBrokenEnvelopes)
+TEST_F(DataTools, ErrorsAreOneLine)
 {
-    // Catches an envelope accepted with a wrong length or checksum, or a refusal
-    // that does not name its fault.
+    // Catches a crash or a multi-line usage dump on a missing or unreadable file or
+    // on bad arguments, an envelope accepted with a wrong length or checksum, and a
+    // refusal that does not name its fault or still writes its output.
     Put("plain.xml", kGoodXml);
     ASSERT_EQ(Run({"data", "scramble", "plain.xml", "good.dat"}).status, 0);
     const std::string good = ReadBytes(Work() / "good.dat");
     std::string changed = good;
     changed[22 + 5] = static_cast<char>(changed[22 + 5] ^ 1);
+    fs::create_directory(Work() / "folder.xml");
+    const std::vector<std::string> unscramble = {"data", "unscramble", "in.dat", "out.xml"};
     struct Row {
         const char* name;
-        std::string bytes;
-        const char* fault;
+        std::vector<std::string> args;
+        const char* fragment;
+        std::string inDat;  // written to in.dat first
     };
     const Row rows[] = {
-        {"one byte more", good + "x", "length"},
-        {"one byte less", good.substr(0, good.size() - 1), "length"},
-        {"changed payload byte", changed, "checksum"},
-        {"plain text", kGoodXml, "not a scrambled file"},
-        {"magic but too short", good.substr(0, 21), "not a scrambled file"},
+        {"one byte more", unscramble, "length", good + "x"},
+        {"one byte less", unscramble, "length", good.substr(0, good.size() - 1)},
+        {"changed payload byte", unscramble, "checksum", changed},
+        {"plain text", unscramble, "not a scrambled file", kGoodXml},
+        {"magic but too short", unscramble, "not a scrambled file", good.substr(0, 21)},
+        {"dump missing", {"data", "dump", "missing.xml"}, "missing.xml", ""},
+        {"check missing", {"data", "check", "missing.xml"}, "missing.xml", ""},
+        {"dump a folder", {"data", "dump", "folder.xml"}, "folder.xml", ""},
+        {"scramble missing", {"data", "scramble", "missing.xml", "out.xml"}, "missing.xml", ""},
+        {"unscramble missing", {"data", "unscramble", "missing.dat", "out.xml"}, "missing.dat", ""},
+        {"no output folder",
+         {"data", "scramble", "plain.xml", "no/such/folder/out.dat"},
+         "no/such/folder/out.dat",
+         ""},
+        {"no subcommand", {"data"}, "steamext data", ""},
+        {"check without files", {"data", "check"}, "steamext data check", ""},
+        {"dump of two files", {"data", "dump", "plain.xml", "plain.xml"}, "steamext data dump", ""},
+        {"answer missing", {"data", "dump", "plain.xml", "--popup-answer"}, "--popup-answer", ""},
+        {"scramble without output", {"data", "scramble", "plain.xml"}, "steamext data scramble", ""},
     };
     for (const Row& row : rows) {
         SCOPED_TRACE(row.name);
-        Put("in.dat", row.bytes);
-        ExpectOneLineError(Run({"data", "unscramble", "in.dat", "out.xml"}), row.fault);
-        EXPECT_FALSE(fs::exists(Work() / "out.xml"));
-    }
-}
-
-TEST_F(DataTools, ErrorsAreOneLine)
-{
-    // Catches a crash or a multi-line usage dump on a missing or unreadable file
-    // or on bad arguments.
-    Put("in.xml", kGoodXml);
-    fs::create_directory(Work() / "folder.xml");
-    struct Row {
-        std::vector<std::string> args;
-        const char* fragment;
-    };
-    const Row rows[] = {
-        {{"data", "dump", "missing.xml"}, "missing.xml"},
-        {{"data", "check", "missing.xml"}, "missing.xml"},
-        {{"data", "dump", "folder.xml"}, "folder.xml"},
-        {{"data", "scramble", "missing.xml", "out.dat"}, "missing.xml"},
-        {{"data", "unscramble", "missing.dat", "out.xml"}, "missing.dat"},
-        {{"data", "scramble", "in.xml", "no/such/folder/out.dat"}, "no/such/folder/out.dat"},
-        {{"data"}, "steamext data"},
-        {{"data", "check"}, "steamext data check"},
-        {{"data", "dump", "in.xml", "in.xml"}, "steamext data dump"},
-        {{"data", "dump", "in.xml", "--popup-answer"}, "--popup-answer"},
-        {{"data", "scramble", "in.xml"}, "steamext data scramble"},
-    };
-    for (const Row& row : rows) {
-        std::string name;
-        for (const std::string& arg : row.args)
-            name += arg + " ";
-        SCOPED_TRACE(name);
+        Put("in.dat", row.inDat);
         ExpectOneLineError(Run(row.args), row.fragment);
+        EXPECT_FALSE(fs::exists(Work() / "out.xml"));
     }
 }
 
