@@ -76,8 +76,8 @@ TEST(Records, PatternsMatchFieldsAndContains)
 
 TEST(Base64, RoundTripsAndRefusesGarbage)
 {
-    for (std::string bytes : {std::string(""), std::string("a"), std::string("ab"), std::string("abc"),
-                              std::string("\0\1\2\3\xff", 5)}) {
+    for (const std::string& bytes : {std::string(""), std::string("a"), std::string("ab"), std::string("abc"),
+                                     std::string("\0\1\2\3\xff", 5)}) {
         bool ok = false;
         EXPECT_EQ(DecodeBase64(EncodeBase64(bytes), ok), bytes);
         EXPECT_TRUE(ok);

@@ -79,15 +79,14 @@ TEST_F(FaultsAndJournal, ResultCodeAndDrop)
     EXPECT_TRUE(dropped.result.IsActive()) << "a zero handle, or a result delivered";
 }
 
-TEST_F(FaultsAndJournal, JournalKeepsOrderArgumentsAndThread)
+TEST_F(FaultsAndJournal, JournalKeepsOrderAndCounts)
 {
     SteamRemoteStorage()->FileWrite("name", "ab", 2);
     SteamUserStats()->GetStat("s", static_cast<int32*>(nullptr));
     SteamAPI_RunCallbacks();
     simclient::Journal j = world.GetJournal();
+    // The arguments' form is played by scenario cloud/reads, the thread by the fold test below.
     EXPECT_EQ(j.Names(), (std::vector<std::string>{"FileWrite", "GetStat", "SteamAPI_RunCallbacks"}));
-    EXPECT_EQ(j.Calls("FileWrite")[0].args, "\"name\", 2");
-    EXPECT_EQ(j.Calls("FileWrite")[0].thread, std::this_thread::get_id());
     EXPECT_TRUE(j.CalledBefore("FileWrite", "SteamAPI_RunCallbacks"));
     EXPECT_FALSE(j.CalledBefore("SteamAPI_RunCallbacks", "FileWrite"));
     EXPECT_EQ(j.IndexOf("StoreStats"), -1);

@@ -23,6 +23,7 @@ TEST_F(Threads, WorkersCallWhileMainThreadPumps)
     constexpr int kWorkers = 4, kCalls = 200;
     std::atomic<int> running{kWorkers};
     std::vector<std::thread> workers;
+    workers.reserve(kWorkers);
     for (int w = 0; w < kWorkers; ++w)
         workers.emplace_back([&, w] {
             for (int i = 0; i < kCalls; ++i) {
