@@ -73,18 +73,16 @@ TEST_F(CallbackClasses, HandleIsClearedBeforeHandlerSoItCanChain)
 // A delivery through the three-argument Run with a foreign handle must be ignored.
 TEST_F(CallbackClasses, ForeignHandleIsIgnored)
 {
-    Catch c;
-    CCallResult<Catch, LeaderboardFindResult_t> result;
     SteamAPICall_t h = StartFind("a");
-    result.Set(h, &c, &Catch::OnResult);
+    ResultCatcher<LeaderboardFindResult_t> c(h);
     LeaderboardFindResult_t payload{};
-    CCallbackBase& base = (CCallbackBase&)result;  // private base: C-style cast
+    CCallbackBase& base = (CCallbackBase&)c.result;  // private base: C-style cast
     base.Run(&payload, false, h + 1000);
     EXPECT_EQ(c.calls, 0);
-    EXPECT_TRUE(result.IsActive());
+    EXPECT_TRUE(c.result.IsActive());
     base.Run(&payload, false, h);
     EXPECT_EQ(c.calls, 1);
-    EXPECT_FALSE(result.IsActive());
+    EXPECT_FALSE(c.result.IsActive());
     EXPECT_EQ(base.GetCallbackSizeBytes(), int(sizeof(LeaderboardFindResult_t)));
     EXPECT_EQ(base.GetICallback(), LeaderboardFindResult_t::k_iCallback);
 }

@@ -65,35 +65,28 @@ TEST_F(FaultsAndJournal, FaultsApplyToTheirCallsInTurn)
 
 TEST_F(FaultsAndJournal, ResultCodeAndDrop)
 {
-    using Catch = Catcher<UserStatsReceived_t>;
-    Catch c;
-    CCallback<Catch, UserStatsReceived_t> cb(&c, &Catch::OnCallback);
+    Listener<UserStatsReceived_t> c;
     world.InjectFault("RequestCurrentStats", Fault::Result(k_EResultTimeout));
     ASSERT_TRUE(SteamUserStats()->RequestCurrentStats());
     SteamAPI_RunCallbacks();
     EXPECT_EQ(c.last.m_eResult, k_EResultTimeout);
 
-    Catcher<LeaderboardFindResult_t> r;
-    CCallResult<Catcher<LeaderboardFindResult_t>, LeaderboardFindResult_t> result;
     world.InjectFault("FindOrCreateLeaderboard", Fault::Drop());
-    SteamAPICall_t h = Find();
-    EXPECT_NE(h, k_uAPICallInvalid);
-    result.Set(h, &r, &Catcher<LeaderboardFindResult_t>::OnResult);
+    ResultCatcher<LeaderboardFindResult_t> dropped(Find());
     for (int i = 0; i < 5; ++i)
         SteamAPI_RunCallbacks();
-    EXPECT_EQ(r.calls, 0);
-    EXPECT_TRUE(result.IsActive());
+    EXPECT_EQ(dropped.calls, 0);
+    EXPECT_TRUE(dropped.result.IsActive()) << "a zero handle, or a result delivered";
 }
 
-TEST_F(FaultsAndJournal, JournalKeepsOrderArgumentsAndThread)
+TEST_F(FaultsAndJournal, JournalKeepsOrderAndCounts)
 {
     SteamRemoteStorage()->FileWrite("name", "ab", 2);
     SteamUserStats()->GetStat("s", static_cast<int32*>(nullptr));
     SteamAPI_RunCallbacks();
     simclient::Journal j = world.GetJournal();
+    // The arguments' form is played by scenario cloud/reads, the thread by the fold test below.
     EXPECT_EQ(j.Names(), (std::vector<std::string>{"FileWrite", "GetStat", "SteamAPI_RunCallbacks"}));
-    EXPECT_EQ(j.Calls("FileWrite")[0].args, "\"name\", 2");
-    EXPECT_EQ(j.Calls("FileWrite")[0].thread, std::this_thread::get_id());
     EXPECT_TRUE(j.CalledBefore("FileWrite", "SteamAPI_RunCallbacks"));
     EXPECT_FALSE(j.CalledBefore("SteamAPI_RunCallbacks", "FileWrite"));
     EXPECT_EQ(j.IndexOf("StoreStats"), -1);
@@ -102,9 +95,7 @@ TEST_F(FaultsAndJournal, JournalKeepsOrderArgumentsAndThread)
 
 TEST_F(FaultsAndJournal, ResetKeepsRegistrationsOnly)
 {
-    using Catch = Catcher<GameOverlayActivated_t>;
-    Catch c;
-    CCallback<Catch, GameOverlayActivated_t> cb(&c, &Catch::OnCallback);
+    Listener<GameOverlayActivated_t> c;
     world.InjectFault("FileWrite", Fault::Fail());
     world.PutFile("x", {1});
     world.Reset();

@@ -49,29 +49,20 @@ TEST_F(Interfaces, LookupNeedsInitAndTheRightVersion)
     SteamAPI_Shutdown();
     EXPECT_EQ(SteamUser(), nullptr);
     EXPECT_EQ(SteamClient(), nullptr);
-    world.SetSteamRunning(false);
-    EXPECT_FALSE(SteamAPI_IsSteamRunning());
-    EXPECT_TRUE(SteamAPI_Init()) << "Init tied to IsSteamRunning";
-    SteamAPI_Shutdown();
-    world.SetInitSucceeds(false);
-    EXPECT_FALSE(SteamAPI_Init());
-    EXPECT_EQ(SteamUtils(), nullptr);
-    world.SetInitSucceeds(true);
     ASSERT_TRUE(SteamAPI_Init());
     EXPECT_NE(SteamUser(), nullptr);
 }
+
+// The tour plays what the module reads here besides: the account id, the server time,
+// the language, the branch, a disabled overlay, a stat set and read, a store that confirms
+// an unlock, and a cloud file written, read, deleted and gone.
 
 TEST_F(Interfaces, UserAndUtils)
 {
     world.SetLocalUser(76561197960265728ull + 77, false, "Me");
     world.SetAppId(1234);
-    world.SetServerTime(99);
-    world.SetOverlayEnabled(false);
     EXPECT_FALSE(SteamUser()->BLoggedOn());
-    EXPECT_EQ(SteamUser()->GetSteamID().GetAccountID(), 77u);
     EXPECT_EQ(SteamUtils()->GetAppID(), 1234u);
-    EXPECT_EQ(SteamUtils()->GetServerRealTime(), 99u);
-    EXPECT_FALSE(SteamUtils()->IsOverlayEnabled());
     SteamUtils()->SetOverlayNotificationPosition(k_EPositionTopRight);
     EXPECT_EQ(world.NotificationPosition(), k_EPositionTopRight);
 }
@@ -80,8 +71,6 @@ TEST_F(Interfaces, LanguageAndBetaBranch)
 {
     world.SetGameLanguage(std::nullopt);
     EXPECT_EQ(SteamApps()->GetCurrentGameLanguage(), nullptr);
-    world.SetGameLanguage("german");
-    EXPECT_STREQ(SteamApps()->GetCurrentGameLanguage(), "german");
 
     char buffer[8];
     std::memset(buffer, 'X', sizeof buffer);
@@ -145,12 +134,8 @@ TEST_F(Interfaces, StatsAndAchievementStore)
     EXPECT_TRUE(SteamUserStats()->SetAchievement("A"));
     EXPECT_TRUE(SteamUserStats()->SetAchievement("B"));  // already unlocked: not "new"
 
-    using Stored = Catcher<UserStatsStored_t>;
-    using Ach = Catcher<UserAchievementStored_t>;
-    Stored s;
-    Ach a;
-    CCallback<Stored, UserStatsStored_t> cs(&s, &Stored::OnCallback);
-    CCallback<Ach, UserAchievementStored_t> ca(&a, &Ach::OnCallback);
+    Listener<UserStatsStored_t> s;
+    Listener<UserAchievementStored_t> a;
     EXPECT_TRUE(SteamUserStats()->StoreStats());
     SteamAPI_RunCallbacks();
     EXPECT_EQ(s.calls, 1);
@@ -164,18 +149,11 @@ TEST_F(Interfaces, StatsAndAchievementStore)
 TEST_F(Interfaces, CloudFiles)
 {
     ISteamRemoteStorage* rs = SteamRemoteStorage();
-    const char data[] = "hello";
-    EXPECT_TRUE(rs->FileWrite("save", data, 5));
-    EXPECT_TRUE(rs->FileExists("save"));
-    EXPECT_EQ(rs->GetFileSize("save"), 5);
+    EXPECT_TRUE(rs->FileWrite("save", "hello", 5));
     char out[8] = {};
-    EXPECT_EQ(rs->FileRead("save", out, sizeof out), 5);
-    EXPECT_STREQ(out, "hello");
     EXPECT_EQ(rs->FileRead("save", out, 2), 2);
+    EXPECT_STREQ(out, "he");
     EXPECT_EQ(rs->FileRead("none", out, 8), 0);
-    EXPECT_TRUE(rs->FileDelete("save"));
-    EXPECT_FALSE(rs->FileDelete("save"));
-    EXPECT_FALSE(rs->FileExists("save"));
     rs->SetCloudEnabledForApp(false);
     EXPECT_EQ(world.CloudEnabledForApp(), false);
 }

@@ -68,9 +68,7 @@ TEST_F(Schedule, EngineTimeFollowsTheTimeSource)
 // A callback an action posts for now is delivered by the pump that ran it.
 TEST_F(Schedule, PostedCallbacksArriveInTheSamePump)
 {
-    using Catch = Catcher<GameOverlayActivated_t>;
-    Catch c;
-    CCallback<Catch, GameOverlayActivated_t> cb(&c, &Catch::OnCallback);
+    Listener<GameOverlayActivated_t> c;
     world.SetJournalEnabled(false);  // the idle fast path must still see the action
     world.After(Delay::Pumps(2), [](WorldData& d) { d.PostNow(GameOverlayActivated_t{1}); });
     SteamAPI_RunCallbacks();
@@ -81,7 +79,6 @@ TEST_F(Schedule, PostedCallbacksArriveInTheSamePump)
 
 TEST_F(Schedule, PersonaNamesArriveOnceOrNever)
 {
-    using Catch = Catcher<PersonaStateChange_t>;
     const uint64 base = 76561197960265728ull;
     struct Row {
         const char* name;
@@ -104,8 +101,7 @@ TEST_F(Schedule, PersonaNamesArriveOnceOrNever)
         SCOPED_TRACE(row.name);
         const CSteamID id(base + ++account);
         row.setUp(world, id.ConvertToUint64());
-        Catch c;
-        CCallback<Catch, PersonaStateChange_t> cb(&c, &Catch::OnCallback);
+        Listener<PersonaStateChange_t> c;
         if (row.pumps < 0) {
             EXPECT_FALSE(SteamFriends()->RequestUserInformation(id, true));
             EXPECT_STREQ(SteamFriends()->GetFriendPersonaName(id), row.arrives);

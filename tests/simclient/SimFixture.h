@@ -63,4 +63,15 @@ template <class P> struct Catcher {
     }
 };
 
+// A catcher registered for its callback for as long as it lives.
+template <class P> struct Listener : Catcher<P> {
+    CCallback<Catcher<P>, P> callback{this, &Catcher<P>::OnCallback};
+};
+
+// A catcher bound to the result of one call.
+template <class P> struct ResultCatcher : Catcher<P> {
+    explicit ResultCatcher(SteamAPICall_t call) { result.Set(call, this, &Catcher<P>::OnResult); }
+    CCallResult<Catcher<P>, P> result;
+};
+
 #endif  // TESTS_SIMCLIENT_SIM_FIXTURE_H

@@ -18,13 +18,12 @@ TEST_F(Threads, WorkersCallWhileMainThreadPumps)
     // Warm the accessors' caches on this thread before the workers use them.
     ASSERT_NE(SteamUserStats(), nullptr);
     ASSERT_NE(SteamRemoteStorage(), nullptr);
-    using Catch = Catcher<UserStatsStored_t>;
-    Catch c;
-    CCallback<Catch, UserStatsStored_t> cb(&c, &Catch::OnCallback);
+    Listener<UserStatsStored_t> c;
 
     constexpr int kWorkers = 4, kCalls = 200;
     std::atomic<int> running{kWorkers};
     std::vector<std::thread> workers;
+    workers.reserve(kWorkers);
     for (int w = 0; w < kWorkers; ++w)
         workers.emplace_back([&, w] {
             for (int i = 0; i < kCalls; ++i) {

@@ -5,6 +5,12 @@
 
 #include "simengine/Engine.h"
 
+// The engine's table, for thread entry points that are given no argument.
+inline HostServices* Host()
+{
+    return simengine::Engine::Instance().Table();
+}
+
 class EngineTest : public ::testing::Test {
 protected:
     void SetUp() override { engine.Reset(); }

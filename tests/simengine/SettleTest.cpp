@@ -11,11 +11,6 @@
 
 namespace {
 
-HostServices* Host()
-{
-    return simengine::Engine::Instance().Table();
-}
-
 // Like a results thread waiting for a player's name: asks until the engine's
 // thread sets it, with no pause between the questions.
 void PollForName(void*)
