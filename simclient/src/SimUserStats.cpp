@@ -15,6 +15,15 @@ uint64 GameIdOr(uint64 configured, AppId_t appId)
     return configured ? configured : appId;
 }
 
+// The statistic a call names, or null when the call fails or the world has no such name.
+int32* FindStat(CallScope& call, const char* name)
+{
+    if (call.faults.fail || !name)
+        return nullptr;
+    auto found = call.state.stats.find(name);
+    return found == call.state.stats.end() ? nullptr : &found->second;
+}
+
 }  // namespace
 
 bool SimSteamUserStats::RequestCurrentStats()
@@ -34,48 +43,40 @@ bool SimSteamUserStats::RequestCurrentStats()
 bool SimSteamUserStats::GetStat(const char* pchName, int32* pData)
 {
     CallScope call(SIM_CALL("GetStat"), Args(pchName));
-    if (call.faults.fail || !pchName || !pData)
+    int32* stat = FindStat(call, pchName);
+    if (!stat || !pData)
         return false;
-    auto found = call.state.stats.find(pchName);
-    if (found == call.state.stats.end())
-        return false;
-    *pData = found->second;
+    *pData = *stat;
     return true;
 }
 
 bool SimSteamUserStats::GetStat(const char* pchName, float* pData)
 {
     CallScope call(SIM_CALL("GetStatFloat"), Args(pchName));
-    if (call.faults.fail || !pchName || !pData)
+    int32* stat = FindStat(call, pchName);
+    if (!stat || !pData)
         return false;
-    auto found = call.state.stats.find(pchName);
-    if (found == call.state.stats.end())
-        return false;
-    *pData = static_cast<float>(found->second);
+    *pData = static_cast<float>(*stat);
     return true;
 }
 
 bool SimSteamUserStats::SetStat(const char* pchName, int32 nData)
 {
     CallScope call(SIM_CALL("SetStat"), Args(pchName, nData));
-    if (call.faults.fail || !pchName)
+    int32* stat = FindStat(call, pchName);
+    if (!stat)
         return false;
-    auto found = call.state.stats.find(pchName);
-    if (found == call.state.stats.end())
-        return false;
-    found->second = nData;
+    *stat = nData;
     return true;
 }
 
 bool SimSteamUserStats::SetStat(const char* pchName, float fData)
 {
     CallScope call(SIM_CALL("SetStatFloat"), Args(pchName, fData));
-    if (call.faults.fail || !pchName)
+    int32* stat = FindStat(call, pchName);
+    if (!stat)
         return false;
-    auto found = call.state.stats.find(pchName);
-    if (found == call.state.stats.end())
-        return false;
-    found->second = static_cast<int32>(fData);
+    *stat = static_cast<int32>(fData);
     return true;
 }
 
