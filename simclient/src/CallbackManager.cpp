@@ -139,8 +139,6 @@ void CCallbackMgr::RunCallbacks()
             CCallbackBase* target = nullptr;
             {
                 std::lock_guard<std::mutex> lock(s.mutex);
-                if (item.onDeliver)
-                    item.onDeliver();
                 auto found = s.callResults.find(item.handle);
                 if (found != s.callResults.end()) {
                     target = found->second;
@@ -161,8 +159,6 @@ void CCallbackMgr::RunCallbacks()
         std::vector<CCallbackBase*> targets;
         {
             std::lock_guard<std::mutex> lock(s.mutex);
-            if (item.onDeliver)
-                item.onDeliver();
             auto found = s.callbacks.find(item.callbackId);
             if (found != s.callbacks.end())
                 targets = found->second;

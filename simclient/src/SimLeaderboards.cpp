@@ -18,7 +18,7 @@ Leaderboard* BoardOf(WorldState& s, SteamLeaderboard_t handle)
     return &s.leaderboards[handle - 1];
 }
 
-// Ranks (1-based) of the given users on the board, best first, each once.
+// Row indices of the given users on the board, best first, each user once.
 std::vector<std::size_t> RowsOfUsers(const Leaderboard& board, std::vector<uint64> users)
 {
     std::vector<std::size_t> indices;

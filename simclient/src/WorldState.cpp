@@ -30,10 +30,10 @@ void WorldState::Record(CallName name, std::string args)
     journal.push_back(JournalEntry{name.text, std::move(args), thread});
 }
 
-void WorldData::PostNow(int callbackId, const void* data, std::size_t size)
+void WorldData::PostAt(uint64 dueAtPump, int callbackId, const void* data, std::size_t size)
 {
     Pending p;
-    p.dueAtPump = pump;
+    p.dueAtPump = dueAtPump;
     p.callbackId = callbackId;
     p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
     queue.push_back(std::move(p));
@@ -108,15 +108,9 @@ AppliedFaults WorldState::TakeFaults(const std::string& call)
     return applied;
 }
 
-void WorldState::QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency,
-                               std::function<void()> onDeliver)
+void WorldState::QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency)
 {
-    Pending p;
-    p.dueAtPump = pump + static_cast<uint64>(std::max(1, latency + extraLatency));
-    p.callbackId = callbackId;
-    p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
-    p.onDeliver = std::move(onDeliver);
-    queue.push_back(std::move(p));
+    PostAt(pump + static_cast<uint64>(std::max(1, latency + extraLatency)), callbackId, data, size);
     SyncQueuedCount();
 }
 

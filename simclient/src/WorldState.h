@@ -30,8 +30,7 @@ struct Pending {
     SteamAPICall_t handle = k_uAPICallInvalid;  // 0: broadcast callback
     bool ioFailure = false;
     std::vector<uint8> payload;
-    std::function<void()> onDeliver;      // runs under the world lock just before delivery
-    std::function<void()> afterDelivery;  // runs under the world lock after it
+    std::function<void()> afterDelivery;  // runs under the world lock after delivery
 };
 
 // Faults that apply to one call, merged from everything queued for its kind.
@@ -182,8 +181,9 @@ struct WorldData {
     }
     // Queues a broadcast callback for the current pump: from a scheduled action, it is
     // delivered by the pump that ran the action.
-    void PostNow(int callbackId, const void* data, std::size_t size);
-    template <class T> void PostNow(const T& data) { PostNow(T::k_iCallback, &data, sizeof(T)); }
+    template <class T> void PostNow(const T& data) { PostAt(pump, T::k_iCallback, &data, sizeof(T)); }
+    // Queues a broadcast callback for the pump `dueAtPump`.
+    void PostAt(uint64 dueAtPump, int callbackId, const void* data, std::size_t size);
 };
 
 // The world: its data, plus what outlives a Reset.
@@ -226,8 +226,7 @@ struct WorldState : WorldData {
     const char* Intern(const std::string& text) { return texts.insert(text).first->c_str(); }
     AppliedFaults TakeFaults(const std::string& call);
     // Queues a broadcast callback after the configured latency.
-    void QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency = 0,
-                       std::function<void()> onDeliver = {});
+    void QueueCallback(int callbackId, const void* data, std::size_t size, int extraLatency = 0);
     // Allocates a handle and queues the result, honouring the faults; returns the handle
     // (k_uAPICallInvalid under ZeroHandle). `afterDelivery` runs under the lock once the
     // result has been dispatched (its handler returned), or was found unbound.

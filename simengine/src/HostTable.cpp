@@ -17,8 +17,7 @@ Engine& E()
 // polls can be told from one that works (ThreadRegistry).
 void Note(const char* name, const std::string& args = std::string())
 {
-    if (ThreadRegistry::IsWatchedThread())
-        E().Threads().NoteCall(std::string(name) + "(" + args + ")");
+    E().Threads().NoteCall(name, args);
 }
 
 std::string Text(const char* text)

@@ -1,6 +1,7 @@
 #include "simengine/ThreadRegistry.h"
 
 #include <algorithm>
+#include <cstddef>
 
 #include <pthread.h>
 
@@ -113,11 +114,12 @@ int ThreadRegistry::RunningCount(const std::string& name) const
     return count;
 }
 
-void ThreadRegistry::NoteCall(const std::string& call)
+void ThreadRegistry::NoteCall(const char* name, const std::string& args)
 {
     auto* self = static_cast<Tracked*>(currentTracked);
     if (self == nullptr)
         return;
+    const std::string call = std::string(name) + "(" + args + ")";
     std::lock_guard<std::mutex> lock(mutex_);
     if (std::find(self->recent.begin(), self->recent.end(), call) == self->recent.end())
         ProgressLocked(self);
@@ -164,8 +166,8 @@ bool ThreadRegistry::Polls(const std::vector<std::string>& calls)
 {
     const std::size_t n = calls.size();
     for (std::size_t cycle = 1; cycle <= kMaxPollCycle && 2 * cycle <= n; ++cycle)
-        if (std::equal(calls.end() - static_cast<long>(cycle), calls.end(),
-                       calls.end() - static_cast<long>(2 * cycle)))
+        if (std::equal(calls.end() - static_cast<std::ptrdiff_t>(cycle), calls.end(),
+                       calls.end() - static_cast<std::ptrdiff_t>(2 * cycle)))
             return true;
     return false;
 }
@@ -187,11 +189,6 @@ std::vector<std::string> ThreadRegistry::RunningNames() const
         if (!tracked->finished.load() && std::find(names.begin(), names.end(), tracked->name) == names.end())
             names.push_back(tracked->name);
     return names;
-}
-
-bool ThreadRegistry::IsWatchedThread()
-{
-    return currentTracked != nullptr;
 }
 
 std::string ThreadRegistry::CurrentName()

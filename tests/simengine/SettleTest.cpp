@@ -27,7 +27,7 @@ std::atomic<bool> nameKnown{false};
 void PollThePlatform(void*)
 {
     while (!nameKnown.load()) {
-        simengine::Engine::Instance().Threads().NoteCall("RequestUserInformation(76561197960287930, true)");
+        simengine::Engine::Instance().Threads().NoteCall("RequestUserInformation", "76561197960287930, true");
         if (Host()->IsQuitting())
             return;
     }

@@ -50,9 +50,9 @@ public:
     int RunningCount(const std::string& name) const;
 
     static constexpr std::size_t kMaxPollCycle = 4;
-    // A call of the calling thread, by name and arguments ("GetProductValue(x)").
-    // Calls of threads the engine did not start are not watched.
-    void NoteCall(const std::string& call);
+    // A call of the calling thread, by name and arguments as text. Calls of
+    // threads the engine did not start are not watched (and cost nothing).
+    void NoteCall(const char* name, const std::string& args);
     // The calling thread goes to sleep in ThreadSleep: progress, not a poll.
     void NoteSleep();
     // The engine's thread has acted: every thread must show its polling anew.
@@ -64,9 +64,6 @@ public:
     int PollingCount(const std::string& name) const;
     // Names of the threads still running, each once.
     std::vector<std::string> RunningNames() const;
-
-    // True on a thread the engine started: the one whose calls are noted.
-    static bool IsWatchedThread();
 
     // Name of the calling thread: its StartThread name, or the name set here
     // ("main" for a thread the engine did not start).

@@ -237,10 +237,9 @@ void EngineSession::Settle()
     lastSettle_ = state_->engine.Settle();
 }
 
-void EngineSession::NotePlatformCall(const std::string& name, const std::string& args)
+void EngineSession::NotePlatformCall(const char* name, const std::string& args)
 {
-    if (simengine::ThreadRegistry::IsWatchedThread())
-        simengine::Engine::Instance().Threads().NoteCall(name + "(" + args + ")");
+    simengine::Engine::Instance().Threads().NoteCall(name, args);
 }
 
 std::vector<json> EngineSession::TakeRecords()

@@ -57,7 +57,7 @@ public:
     const simengine::Engine::SettleReport& LastSettle() const { return lastSettle_; }
     // A platform call made on the calling thread, for telling polls from work;
     // the simulated client's call observer feeds it.
-    static void NotePlatformCall(const std::string& name, const std::string& args);
+    static void NotePlatformCall(const char* name, const std::string& args);
 
     // What the module did to the engine since the last call, in order.
     std::vector<nlohmann::json> TakeRecords();
