@@ -8,6 +8,7 @@
 #include "services/achievements/AchievementImplementationSteam.h"
 #include "services/achievements/SteamAchievements.h"
 #include "services/cloud/CloudImplementationSteam.h"
+#include "services/store/InAppPurchaseSteam.h"
 
 const char* ExtensionModuleSteam::GetName()
 {
@@ -44,7 +45,9 @@ void ExtensionModuleSteam::Update()
 {
     if (steamManager.initialised)
         SteamAPI_RunCallbacks();
-    // The store's purchase scan joins here once the store service exists.
+    // Behind the pump: an overlay that closed in it has been seen first.
+    if (inAppPurchase != nullptr)
+        inAppPurchase->CheckPurchases();
 }
 
 const char* ExtensionModuleSteam::Command(const char* name, const char* argument)
@@ -59,7 +62,9 @@ BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumbe
         return cloud;
     case kServiceAchievements:
         return achievements;
-    // Store (4), leaderboards (2) and workshop (6) are not built yet: their
+    case kServiceStore:
+        return inAppPurchase;
+    // Leaderboards (2) and workshop (6) are not built yet: their
     // fields stay null, as before a successful Initialize.
     default:
         return nullptr;
@@ -70,6 +75,7 @@ void ExtensionModuleSteam::CreateServices()
 {
     // Strictly in the order store, leaderboards, cloud, achievements, workshop,
     // each pointer stored as soon as its object exists.
+    inAppPurchase = new InAppPurchaseSteam();
     cloud = new CloudImplementationSteam();
     achievements = new AchievementImplementationSteam();
 }

@@ -161,7 +161,7 @@ TEST_F(Achievements, AfterShutdownTheHandlersAreGone)
     EXPECT_EQ(world.RegisteredCallbackCount(1101), 0);
     EXPECT_EQ(world.RegisteredCallbackCount(1102), 0);
     EXPECT_EQ(world.RegisteredCallbackCount(1103), 0);
-    EXPECT_EQ(world.RegisteredCallbackCount(331), 1);  // the overlay's stays until unload
+    EXPECT_EQ(world.RegisteredCallbackCount(331), 2);  // the overlay's and the store's stay until unload
 }
 
 }  // namespace
