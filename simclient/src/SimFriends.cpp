@@ -1,4 +1,5 @@
-// ISteamFriends: persona names and the overlay requests (recorded, never shown).
+// ISteamFriends: persona names, and the overlay requests: recorded, and a store request
+// opens the overlay and plays the scripted visit (World::SetStoreVisit).
 #include <algorithm>
 
 #include "Args.h"
@@ -7,6 +8,37 @@
 
 namespace simclient {
 namespace {
+
+void PostOverlay(WorldData& d, bool active)
+{
+    d.overlayShown = active;
+    GameOverlayActivated_t overlay{};
+    overlay.m_bActive = active ? 1 : 0;
+    d.PostNow(overlay);
+}
+
+// At the pump after a store request: the overlay opens, then the user acts as scripted.
+void PlayStoreVisit(WorldData& d, const std::optional<StoreVisit>& visit, AppId_t product)
+{
+    if (!d.overlayShown)
+        PostOverlay(d, true);
+    if (!visit)
+        return;
+    if (visit->buyAfter) {
+        const Delay installAfter = visit->installAfter;
+        d.RunAfter(*visit->buyAfter, [installAfter, product](WorldData& bought) {
+            bought.RunAfter(installAfter, [product](WorldData& installing) {
+                for (Dlc& dlc : installing.dlcs)
+                    if (dlc.appId == product)
+                        dlc.installed = true;
+            });
+        });
+    }
+    d.RunAfter(visit->closeAfter, [](WorldData& closing) {
+        if (closing.overlayShown)
+            PostOverlay(closing, false);
+    });
+}
 
 class SimSteamFriends final : public ISteamFriends {
 public:
@@ -34,7 +66,14 @@ public:
     void ActivateGameOverlayToStore(AppId_t nAppID, EOverlayToStoreFlag eFlag) override
     {
         CallScope call(SIM_CALL("ActivateGameOverlayToStore"), Args(nAppID, eFlag));
-        call.state.storeRequests.emplace_back(nAppID, eFlag);
+        WorldState& s = call.state;
+        s.storeRequests.emplace_back(nAppID, eFlag);
+        if (call.faults.fail || !s.overlayEnabled)
+            return;
+        std::optional<StoreVisit> visit = s.storeVisit;
+        s.ScheduleAt(Due::Pump(s.pump + 1),
+                     [visit, nAppID](WorldData& d) { PlayStoreVisit(d, visit, nAppID); });
+        s.SyncQueuedCount();
     }
 
     // True while the name is not known. The first such request starts the one lookup

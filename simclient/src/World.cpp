@@ -132,8 +132,18 @@ void World::PostCallback(int callbackId, const void* data, std::size_t size)
     auto l = Lock();
     State().QueueCallback(callbackId, data, size);
 }
+void World::SetStoreVisit(std::optional<StoreVisit> visit)
+{
+    auto l = Lock();
+    State().storeVisit = visit;
+}
+
 void World::SetOverlayActive(bool active)
 {
+    {
+        auto l = Lock();
+        State().overlayShown = active;
+    }
     GameOverlayActivated_t overlay{};
     overlay.m_bActive = active ? 1 : 0;
     Post(overlay);

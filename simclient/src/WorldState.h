@@ -120,6 +120,8 @@ struct WorldData {
     std::optional<std::string> language = std::string("english");
     std::optional<std::string> beta;
     std::vector<Dlc> dlcs;
+    bool overlayShown = false;  // opened by a store request or SetOverlayActive, not closed since
+    std::optional<StoreVisit> storeVisit;
     SteamAPIWarningMessageHook_t warningHook = nullptr;
 
     // Dispatch and schedule
@@ -178,6 +180,14 @@ struct WorldData {
     void ScheduleAt(Due due, WorldAction action)
     {
         scheduled.push_back(Scheduled{due, nextScheduleOrder++, std::move(action)});
+    }
+    // From a scheduled action: `action` now when `delay` is nothing, else `delay` later.
+    void RunAfter(Delay delay, const WorldAction& action)
+    {
+        if (delay.amount == 0)
+            action(*this);
+        else
+            ScheduleAt(DueAfter(delay), action);
     }
     // Queues a broadcast callback for the current pump: from a scheduled action, it is
     // delivered by the pump that ran the action.

@@ -45,6 +45,19 @@ struct Dlc {
     std::string name;
 };
 
+// What the user does in the store overlay that ActivateGameOverlayToStore opens. The
+// overlay opens at the next pump (GameOverlayActivated_t, m_bActive 1); from then on,
+// after `buyAfter` the user buys the product shown (never without one), after
+// `closeAfter` the overlay closes (m_bActive 0), and `installAfter` from the purchase
+// the product shows as installed, which may fall before or after the closing. Changes
+// due at one pump happen before that pump's deliveries, so a product installed at the
+// pump of the closing is installed when the closing is delivered.
+struct StoreVisit {
+    std::optional<Delay> buyAfter;
+    Delay closeAfter = Delay::Pumps(1);
+    Delay installAfter = Delay::Pumps(0);
+};
+
 struct LeaderboardRow {
     uint64 steamId = 0;
     int32 score = 0;
@@ -112,6 +125,11 @@ public:
     void SetBetaName(std::optional<std::string> branch);                // nullopt: not on a beta
     void SetDlcs(std::vector<Dlc> dlcs);
     void SetDlcInstalled(AppId_t appId, bool installed);
+    // Played by every later store request while the overlay is enabled. Without one (the
+    // default) the overlay opens and stays open until SetOverlayActive(false). A request
+    // while the overlay is open shows the page there: no second opening, the visit plays
+    // from the request's next pump. With the overlay disabled a request only is recorded.
+    void SetStoreVisit(std::optional<StoreVisit> visit);
 
     // --- Callbacks --------------------------------------------------------------------------
     // Pumps a posted callback or call result waits (1 = the next RunCallbacks).

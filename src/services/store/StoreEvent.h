@@ -12,8 +12,8 @@ struct StoreEvent {
     int32_t status;
     const char* itemId;  // a block of Allocate, or null
     uint8_t itemState;
-    int64_t reserved24;  // always 0 in events 33 and 34
-    int64_t reserved32;  // always 0 in events 33 and 34
+    int64_t reserved24;      // always 0 in events 33 and 34
+    int64_t reserved32;      // always 0 in events 33 and 34
     const char* purchaseId;  // event 34 only: a second block, or null
     unsigned char unused[24];
 };
