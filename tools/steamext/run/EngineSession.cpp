@@ -94,9 +94,12 @@ json ToRecord(const simengine::PostedEvent& event)
         record["entries"] = event.scores->entriesNull ? json(nullptr) : rows;
     }
     if (event.store) {
+        // Only the fields each type sets: 32 the id, 33 also the state, 34 all three.
         record["itemId"] = Text(event.store->itemId);
-        record["itemState"] = event.store->itemState;
-        record["purchaseId"] = Text(event.store->purchaseId);
+        if (event.type != kEventStoreStarted)
+            record["itemState"] = event.store->itemState;
+        if (event.type == kEventStorePurchaseOutcome)
+            record["purchaseId"] = Text(event.store->purchaseId);
     }
     if (event.thread != "main")
         record["thread"] = event.thread;

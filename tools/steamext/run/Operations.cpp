@@ -146,6 +146,7 @@ const OperationTable& Operations()
         RegisterModuleOperations(built);
         RegisterAchievementOperations(built);
         RegisterCloudOperations(built);
+        RegisterStoreOperations(built);
         return built;
     }();
     return table;

@@ -2,6 +2,8 @@
 
 #include <simclient/World.h>
 
+#include "run/StoreWorldSetup.h"
+
 namespace steamext::run {
 
 using nlohmann::json;
@@ -195,6 +197,9 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
                                                    "stats_received_result",
                                                    "stats_stored_result",
                                                    "cloud_files",
+                                                   "dlcs",
+                                                   "dlc_installed",
+                                                   "store_visit",
                                                    "clear_faults",
                                                    "faults",
                                                    "overlay_active",
@@ -265,6 +270,8 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
             edits.push_back(ParseStatsResult(r, value, at, key == "stats_received_result"));
         } else if (key == "cloud_files") {
             edits.push_back(ParseCloudFiles(r, value, at));
+        } else if (IsStoreWorldKey(key)) {
+            edits.push_back(ParseStoreWorldKey(r, key, value, at));
         } else if (key == "faults") {
             edits.push_back(ParseFaults(r, value, at));
         } else if (key == "clear_faults") {
