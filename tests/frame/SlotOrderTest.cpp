@@ -38,7 +38,7 @@ TEST_F(SlotOrder, ModuleTable)
 TEST_F(SlotOrder, CommonServiceOperations)
 {
     ASSERT_TRUE(Start());
-    for (int32_t number : {1, 3}) {
+    for (int32_t number : {1, 3, 4}) {
         SCOPED_TRACE(number);
         BaseImplementation* service = module->GetImplementation(number);
         ASSERT_NE(service, nullptr);
@@ -82,6 +82,29 @@ TEST_F(SlotOrder, CloudOperations)
     engine.Table()->ReleaseBuffer(buffer);
     EXPECT_TRUE(CallSlot<bool>(service, 10, "slot1"));
     EXPECT_FALSE(world.File("slot1").has_value());
+}
+
+TEST_F(SlotOrder, StoreOperations)
+{
+    world.SetDlcs({{1001, false, true, "Sword"}});
+    engine.Files().AddMemoryFile(
+        "in-app-purchases/in-app-purchases.xml",
+        "<?xml version=\"1.0\"?><root><array id=\"ITEMS\"><node id=\"a\" steam_id=\"1001\"/></array></root>");
+    ASSERT_TRUE(Start());
+    BaseImplementation* service = module->GetImplementation(4);
+    ASSERT_NE(service, nullptr);
+    EXPECT_FALSE(CallSlot<bool>(service, 7));  // not available before Initialize
+    ASSERT_TRUE(CallSlot<bool>(service, 4));
+    uint64_t mark = engine.Records().Mark();
+    CallSlot<void>(service, 8, "a");
+    CallSlot<void>(service, 10);
+    std::vector<int> states;
+    for (const auto& event : engine.Records().Since(mark).Events(33))
+        states.push_back(event.store->itemState);
+    EXPECT_EQ(states, (std::vector<int>{1, 0}));  // installed, then not available
+    CallSlot<void>(service, 9, "a");
+    EXPECT_EQ(world.StoreOverlayRequests().size(), 1u);
+    EXPECT_TRUE(CallSlot<bool>(service, 11));
 }
 
 }  // namespace

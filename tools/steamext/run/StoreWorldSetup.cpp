@@ -68,14 +68,17 @@ simclient::Delay ParseDelay(const ScenarioFile& r, const json& value, const std:
     if (value.size() != 1)
         r.Fail(at, "a delay is {\"pumps\": n} or {\"ms\": n}");
     if (value.contains("pumps"))
-        return simclient::Delay::Pumps(static_cast<uint64_t>(r.Int(value["pumps"], ScenarioFile::Child(at, "pumps"), 0)));
-    return simclient::Delay::EngineMs(static_cast<uint64_t>(r.Int(value["ms"], ScenarioFile::Child(at, "ms"), 0)));
+        return simclient::Delay::Pumps(
+            static_cast<uint64_t>(r.Int(value["pumps"], ScenarioFile::Child(at, "pumps"), 0)));
+    return simclient::Delay::EngineMs(
+        static_cast<uint64_t>(r.Int(value["ms"], ScenarioFile::Child(at, "ms"), 0)));
 }
 
 WorldEdit ParseStoreVisit(const ScenarioFile& r, const json& value, const std::string& pointer)
 {
     if (value.is_null())
-        return {"store_visit = null (the overlay stays open)", [](World& w) { w.SetStoreVisit(std::nullopt); }};
+        return {"store_visit = null (the overlay stays open)",
+                [](World& w) { w.SetStoreVisit(std::nullopt); }};
     r.Object(value, pointer);
     r.OnlyKeys(value, pointer, {"buy_after", "close_after", "install_after"});
     if (!value.contains("close_after"))
@@ -88,7 +91,8 @@ WorldEdit ParseStoreVisit(const ScenarioFile& r, const json& value, const std::s
         if (!visit.buyAfter)
             r.Fail(ScenarioFile::Child(pointer, "install_after"),
                    "only a product bought installs: give \"buy_after\" too");
-        visit.installAfter = ParseDelay(r, value["install_after"], ScenarioFile::Child(pointer, "install_after"));
+        visit.installAfter =
+            ParseDelay(r, value["install_after"], ScenarioFile::Child(pointer, "install_after"));
     }
     return {"store_visit = " + Shown(value), [visit](World& w) { w.SetStoreVisit(visit); }};
 }

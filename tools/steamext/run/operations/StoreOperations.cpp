@@ -17,7 +17,10 @@ void RegisterStoreOperations(OperationTable& table)
 {
     using Args = std::vector<ArgValue>;
     AddBaseOperations(table, "store", kServiceStore);
-    table.Add({"store.QueryItems", {{"list", ArgType::Text}}, ResultType::None, [](const CallTarget& t, const Args& a) {
+    table.Add({"store.QueryItems",
+               {{"list", ArgType::Text}},
+               ResultType::None,
+               [](const CallTarget& t, const Args& a) {
                    Store(t)->QueryItems(TextArg(a[0]));
                    return NoResult();
                }});
