@@ -38,7 +38,8 @@ protected:
     {
         ModuleTest::SetUp();
         engine.Files().AddMemoryFile("in-app-purchases/in-app-purchases.xml", kConfiguration);
-        world.SetDlcs({{1001, true, false, "Sword"}, {1002, true, false, "Shield"}, {1003, false, false, "Horse"}});
+        world.SetDlcs(
+            {{1001, true, false, "Sword"}, {1002, true, false, "Shield"}, {1003, false, false, "Horse"}});
     }
 
     void StartStore()
@@ -128,7 +129,8 @@ TEST_F(Store, PendingPurchaseStates)
         case Happening::AddressPurchase:
             world.SetOverlayEnabled(false);
             store->PurchaseItem("1002");
-            EXPECT_EQ(engine.Records().Since(mark).Commands("OpenURL").at(0).argument, "steam://purchase/1002");
+            EXPECT_EQ(engine.Records().Since(mark).Commands("OpenURL").at(0).argument,
+                      "steam://purchase/1002");
             break;
         case Happening::CloseInstalled:
             world.SetDlcInstalled(1001, true);

@@ -1,9 +1,12 @@
 // "steamext data check FILE...": each file loaded as the module would, popups
-// answered "give up"; the module's messages as they reach the engine, then one
-// verdict line per file. Exit 1 if a file failed to load, 2 if one was unreadable.
+// answered "give up"; the module's messages as they reach the engine, warnings
+// about what the module would ignore in a file it knows, then one verdict line
+// per file. Exit 1 if a file failed to load (or, with --strict, got a warning),
+// 2 if one was unreadable.
 #include <iostream>
 
 #include "data/DataTool.h"
+#include "data/InAppPurchaseWarnings.h"
 
 namespace datatool {
 
@@ -11,6 +14,7 @@ namespace {
 
 struct CheckOptions {
     std::vector<std::string> files;
+    bool strict = false;
 };
 
 const char* KindName(const simengine::LogLine& line)
@@ -49,13 +53,18 @@ int RunCheck(const CheckOptions& options)
                     std::cout << "ShowPopup: " << command->argument.value_or("") << "\n";
             }
         }
+        int warnings = WarnAboutInAppPurchases(file, bytes, outcome, std::cout);
         int arrays = 0;
         int nodes = 0;
         for (const DataArray* array : outcome.database->arrays) {
             ++arrays;
             nodes += array->nodes.count;
         }
-        if (outcome.loaded) {
+        if (outcome.loaded && options.strict && warnings > 0) {
+            std::cout << file << ": FAILED: " << warnings << " warning(s) under --strict\n";
+            if (status == 0)
+                status = 1;
+        } else if (outcome.loaded) {
             std::cout << file << ": ok (" << arrays << " arrays, " << nodes << " nodes)\n";
         } else {
             std::cout << file << ": FAILED to load\n";
@@ -74,6 +83,7 @@ void AddCheckCommand(CLI::App& data, SubcommandAction& action)
     CLI::App* check =
         data.add_subcommand("check", "Load each file as the module would and report what it says");
     check->add_option("files", options->files, "Data files (.xml, .dat, .csv)")->required();
+    check->add_flag("--strict", options->strict, "Fail a file that gets warnings, as one that does not load");
     check->callback([options, &action] { action = [options] { return RunCheck(*options); }; });
 }
 

@@ -1,0 +1,171 @@
+#include "data/InAppPurchaseWarnings.h"
+
+#include <cctype>
+#include <cstring>
+#include <map>
+#include <vector>
+
+#include "data/Database.h"
+#include "data/XmlReader.h"
+#include "services/store/ProductNumber.h"
+
+namespace datatool {
+
+namespace {
+
+const char kFileName[] = "in-app-purchases.xml";
+
+bool EndsWith(const std::string& text, const std::string& end)
+{
+    return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
+}
+
+bool IsId(const char* name)
+{
+    return name != nullptr && std::strcmp(name, "id") == 0;
+}
+
+// The line of each node tag of the first array "ITEMS", in file order, as the
+// loader makes its nodes; empty when the text does not read.
+std::vector<int> ItemLines(const std::string& path, const std::string& bytes)
+{
+    std::vector<int> lines;
+    XmlReader reader;
+    if (!reader.OpenFromMemory(path.c_str(), bytes.data(), static_cast<int64_t>(bytes.size())))
+        return lines;
+    int line = 1;
+    int32_t counted = 0;  // bytes of the text whose line breaks are in `line`
+    bool inItems = false;
+    bool itemsSeen = false;
+    for (;;) {
+        int32_t start = reader.cursor;
+        while (start < reader.size && std::isspace(static_cast<unsigned char>(reader.data[start])) != 0)
+            ++start;
+        const XmlBlock* block = reader.ReadBlock();
+        if (block == nullptr)
+            return lines;
+        for (; counted < start; ++counted)
+            line += reader.data[counted] == '\n' ? 1 : 0;
+        if (block->name == nullptr)
+            continue;
+        if (std::strcmp(block->name, "array") == 0) {
+            bool named = false;
+            for (int32_t i = 0; i < block->count; ++i)
+                named = named || (IsId(block->attributeNames[i]) && std::strcmp(block->attributeValues[i], "ITEMS") == 0);
+            inItems = !block->closing && named && !itemsSeen;
+            itemsSeen = itemsSeen || inItems;
+        } else if (inItems && std::strcmp(block->name, "node") == 0 && !(block->closing && block->count == 0)) {
+            lines.push_back(line);
+        }
+    }
+}
+
+// What the text holds beside the digits the platform gets.
+bool HasTextAfterDigits(const char* text)
+{
+    const char* at = text;
+    while (std::isspace(static_cast<unsigned char>(*at)) != 0)
+        ++at;
+    if (*at == '+' || *at == '-')
+        ++at;
+    const char* digits = at;
+    while (std::isdigit(static_cast<unsigned char>(*at)) != 0)
+        ++at;
+    return at != digits && *at != '\0';
+}
+
+bool IsPlainDigits(const char* text)
+{
+    if (*text == '\0')
+        return false;
+    for (const char* at = text; *at != '\0'; ++at) {
+        if (std::isdigit(static_cast<unsigned char>(*at)) == 0)
+            return false;
+    }
+    return true;
+}
+
+class Reporter {
+public:
+    Reporter(const std::string& path, std::ostream& out) : path_(path), out_(out) {}
+
+    void Warn(int line, const std::string& text)
+    {
+        out_ << path_;
+        if (line > 0)
+            out_ << ":" << line;
+        out_ << ": warning: " << text << "\n";
+        ++count_;
+    }
+    int Count() const { return count_; }
+
+private:
+    const std::string& path_;
+    std::ostream& out_;
+    int count_ = 0;
+};
+
+void CheckValue(Reporter& report, int line, const std::string& item, const char* text)
+{
+    const std::string shown = std::string("\"steam_id\" \"") + text + "\"";
+    const int32_t number = ParseProductNumber(text);
+    if (number == 0) {
+        report.Warn(line, item + ": " + shown + " reads as 0: the item is not sold");
+        return;
+    }
+    if (HasTextAfterDigits(text))
+        report.Warn(line, item + ": " + shown + " has characters after its digits: the platform is asked about " +
+                              std::to_string(number) + ", the store address gets the whole text");
+    else if (!IsPlainDigits(text))
+        report.Warn(line, item + ": " + shown + " is not plain decimal digits: the platform is asked about " +
+                              std::to_string(number) + ", the store address gets the whole text");
+}
+
+}  // namespace
+
+int WarnAboutInAppPurchases(const std::string& path, const std::string& bytes, const LoadOutcome& outcome,
+                            std::ostream& out)
+{
+    const bool known = path == kFileName || EndsWith(path, std::string("/") + kFileName);
+    if (!known || !outcome.loaded)
+        return 0;
+    Reporter report(path, out);
+    const DataArray* items = outcome.database->FindArray("ITEMS");
+    if (items == nullptr) {
+        report.Warn(0, "no array \"ITEMS\": nothing is sold");
+        return report.Count();
+    }
+    std::vector<int> lines = ItemLines(path, bytes);
+    if (lines.size() != static_cast<size_t>(items->nodes.count))
+        lines.assign(static_cast<size_t>(items->nodes.count), 0);  // the shape is odd: no lines then
+
+    std::map<std::string, int> firstLine;
+    for (int32_t index = 0; index < items->nodes.count; ++index) {
+        const DataNode* node = items->nodes[index];
+        const int line = lines[static_cast<size_t>(index)];
+        if (node->id.text == nullptr) {
+            report.Warn(line, "an item without an id: nothing can ask for it");
+            continue;
+        }
+        const std::string id = node->id.text;
+        const std::string item = "item \"" + id + "\"";
+        if (!firstLine.emplace(id, line).second) {
+            report.Warn(line, item + " repeats an id (first at line " + std::to_string(firstLine[id]) +
+                                  "): only the first is read");
+            continue;
+        }
+        const char* value = node->GetValue("steam_id");
+        if (value == nullptr) {
+            report.Warn(line, item + " has no \"steam_id\": the item is not sold");
+            continue;
+        }
+        CheckValue(report, line, item, value);
+        const int32_t number = ParseProductNumber(value);
+        if (number != 0 && id != std::to_string(number))
+            report.Warn(line, item + " is product " + std::to_string(number) + " but its id is not \"" +
+                                  std::to_string(number) + "\": a purchase of it is never reported");
+    }
+    return report.Count();
+}
+
+}  // namespace datatool
