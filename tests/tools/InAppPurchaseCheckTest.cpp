@@ -35,8 +35,8 @@ protected:
 
     Outcome Check(const std::string& flags) const
     {
-        const std::string command = "cd '" + root_.string() + "' && '" + STEAMEXT_PROGRAM + "' data check " + flags +
-                                    " in-app-purchases/in-app-purchases.xml 2>/dev/null";
+        const std::string command = "cd '" + root_.string() + "' && '" + STEAMEXT_PROGRAM + "' data check " +
+                                    flags + " in-app-purchases/in-app-purchases.xml 2>/dev/null";
         Outcome outcome;
         FILE* pipe = popen(command.c_str(), "r");
         char buffer[512];
@@ -65,13 +65,20 @@ TEST_F(InAppPurchaseCheck, WarnsWithTheLineAboutWhatTheModuleIgnores)
         "</array>\n</root>\n");
     const std::string file = "in-app-purchases/in-app-purchases.xml";
     const std::string expected =
-        file + ":5: warning: item \"sword\" is product 1002 but its id is not \"1002\": a purchase of it is never reported\n" +
-        file + ":6: warning: item \"01003\" is product 1003 but its id is not \"1003\": a purchase of it is never reported\n" +
-        file + ":7: warning: item \"1004\": \"steam_id\" \"1004abc\" has characters after its digits: the platform is asked about 1004, the store address gets the whole text\n" +
-        file + ":8: warning: item \"free\": \"steam_id\" \"0\" reads as 0: the item is not sold\n" +
-        file + ":9: warning: item \"nothing\" has no \"steam_id\": the item is not sold\n" +
-        file + ":10: warning: item \"1001\" repeats an id (first at line 4): only the first is read\n" +
-        file + ":11: warning: item \"1005\": \"steam_id\" \"+1005\" is not plain decimal digits: the platform is asked about 1005, the store address gets the whole text\n" +
+        file +
+        ":5: warning: item \"sword\" is product 1002 but its id is not \"1002\": a purchase of it is never "
+        "reported\n" +
+        file +
+        ":6: warning: item \"01003\" is product 1003 but its id is not \"1003\": a purchase of it is never "
+        "reported\n" +
+        file +
+        ":7: warning: item \"1004\": \"steam_id\" \"1004abc\" has characters after its digits: the platform "
+        "is asked about 1004, the store address gets the whole text\n" +
+        file + ":8: warning: item \"free\": \"steam_id\" \"0\" reads as 0: the item is not sold\n" + file +
+        ":9: warning: item \"nothing\" has no \"steam_id\": the item is not sold\n" + file +
+        ":10: warning: item \"1001\" repeats an id (first at line 4): only the first is read\n" + file +
+        ":11: warning: item \"1005\": \"steam_id\" \"+1005\" is not plain decimal digits: the platform is "
+        "asked about 1005, the store address gets the whole text\n" +
         file + ": ok (1 arrays, 8 nodes)\n";
     Outcome plain = Check("");
     EXPECT_EQ(plain.status, 0);
@@ -79,7 +86,8 @@ TEST_F(InAppPurchaseCheck, WarnsWithTheLineAboutWhatTheModuleIgnores)
 
     Outcome strict = Check("--strict");
     EXPECT_EQ(strict.status, 1);
-    EXPECT_NE(strict.out.find(file + ": FAILED: 7 warning(s) under --strict\n"), std::string::npos) << strict.out;
+    EXPECT_NE(strict.out.find(file + ": FAILED: 7 warning(s) under --strict\n"), std::string::npos)
+        << strict.out;
 }
 
 TEST_F(InAppPurchaseCheck, CleanFilesPassStrict)

@@ -178,14 +178,18 @@ void InAppPurchaseSteam::OnOverlayActivated(GameOverlayActivated_t* param)
 
 void InAppPurchaseSteam::CheckPurchases()
 {
-    ISteamApps* apps = SteamApps();
-    if (apps == nullptr || enabled == 0)
+    if (enabled == 0)
         return;
-    // The engine's clock wraps; only the signed 32-bit difference counts, so a
-    // clock that went back waits until it has passed the last scan again.
+    // Called every frame: the clock test comes first, and an idle frame costs
+    // this one reading. The engine's clock wraps; only the signed 32-bit
+    // difference counts, so a clock that went back waits until it has passed
+    // the last scan again.
     const int32_t sinceLastScan =
         static_cast<int32_t>(hostServices->GetTimeMs() - static_cast<uint32_t>(lastCheckMs));
     if (sinceLastScan < kScanIntervalMs)
+        return;
+    ISteamApps* apps = SteamApps();
+    if (apps == nullptr)
         return;
     lastCheckMs = static_cast<int32_t>(hostServices->GetTimeMs());
 

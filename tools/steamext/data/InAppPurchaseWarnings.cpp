@@ -51,10 +51,12 @@ std::vector<int> ItemLines(const std::string& path, const std::string& bytes)
         if (std::strcmp(block->name, "array") == 0) {
             bool named = false;
             for (int32_t i = 0; i < block->count; ++i)
-                named = named || (IsId(block->attributeNames[i]) && std::strcmp(block->attributeValues[i], "ITEMS") == 0);
+                named = named || (IsId(block->attributeNames[i]) &&
+                                  std::strcmp(block->attributeValues[i], "ITEMS") == 0);
             inItems = !block->closing && named && !itemsSeen;
             itemsSeen = itemsSeen || inItems;
-        } else if (inItems && std::strcmp(block->name, "node") == 0 && !(block->closing && block->count == 0)) {
+        } else if (inItems && std::strcmp(block->name, "node") == 0 &&
+                   !(block->closing && block->count == 0)) {
             lines.push_back(line);
         }
     }
@@ -114,7 +116,8 @@ void CheckValue(Reporter& report, int line, const std::string& item, const char*
         return;
     }
     if (HasTextAfterDigits(text))
-        report.Warn(line, item + ": " + shown + " has characters after its digits: the platform is asked about " +
+        report.Warn(line, item + ": " + shown +
+                              " has characters after its digits: the platform is asked about " +
                               std::to_string(number) + ", the store address gets the whole text");
     else if (!IsPlainDigits(text))
         report.Warn(line, item + ": " + shown + " is not plain decimal digits: the platform is asked about " +
