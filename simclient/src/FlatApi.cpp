@@ -102,6 +102,11 @@ S_API HSteamPipe SteamAPI_GetHSteamPipe()
 S_API void* S_CALLTYPE SteamInternal_ContextInit(void* pContextInitData)
 {
     uintptr_t* ctx = static_cast<uintptr_t*>(pContextInitData);
+    // The accessors run on every call into an interface, often every frame: a context
+    // that is up to date costs one atomic read, as with the platform's own library.
+    // The stamp is published after the pointers it guards.
+    if (__atomic_load_n(&ctx[1], __ATOMIC_ACQUIRE) == State().generation.load(std::memory_order_acquire))
+        return &ctx[2];
     std::lock_guard<std::mutex> lock(g_contextMutex);
     uintptr_t generation = State().generation.load(std::memory_order_acquire);
     if (ctx[1] != generation) {
@@ -109,7 +114,7 @@ S_API void* S_CALLTYPE SteamInternal_ContextInit(void* pContextInitData)
         // this one is a different mutex, so that is fine.
         auto init = reinterpret_cast<void (*)(void*)>(ctx[0]);
         init(&ctx[2]);
-        ctx[1] = generation;
+        __atomic_store_n(&ctx[1], generation, __ATOMIC_RELEASE);
     }
     return &ctx[2];
 }

@@ -178,18 +178,16 @@ void InAppPurchaseSteam::OnOverlayActivated(GameOverlayActivated_t* param)
 
 void InAppPurchaseSteam::CheckPurchases()
 {
-    if (enabled == 0)
+    ISteamApps* apps = SteamApps();
+    if (enabled == 0 || apps == nullptr)
         return;
-    // Called every frame: the clock test comes first, and an idle frame costs
-    // this one reading. The engine's clock wraps; only the signed 32-bit
+    // Called every frame: beyond the interface's cached pointer an idle frame
+    // costs one clock reading. The engine's clock wraps; only the signed 32-bit
     // difference counts, so a clock that went back waits until it has passed
     // the last scan again.
     const int32_t sinceLastScan =
         static_cast<int32_t>(hostServices->GetTimeMs() - static_cast<uint32_t>(lastCheckMs));
     if (sinceLastScan < kScanIntervalMs)
-        return;
-    ISteamApps* apps = SteamApps();
-    if (apps == nullptr)
         return;
     lastCheckMs = static_cast<int32_t>(hostServices->GetTimeMs());
 
