@@ -1,0 +1,51 @@
+#include "services/leaderboards/SteamScoreClient.h"
+
+#include <cstring>
+#include <initializer_list>
+
+#include "foundation/TextFormat.h"
+#include "host/HostReport.h"
+#include "services/leaderboards/ClientList.h"
+#include "services/leaderboards/LeaderboardsImplementation.h"
+
+void SteamScoreClient::OnCreateLeaderboard(LeaderboardFindResult_t* result, bool ioFailure)
+{
+    const SteamLeaderboard_t handle = result->m_hSteamLeaderboard;
+    if (result->m_bLeaderboardFound != 0 && !ioFailure) {
+        const char* boardName = SteamUserStats()->GetLeaderboardName(handle);
+        HostLog(kHostLogInfo, "OnCreateLeaderboard: Found leaderboard (handle = %d, name = %s), %s",
+                static_cast<int32_t>(handle), boardName, "no errors detected");
+        leaderboard.store(handle, std::memory_order_release);
+        return;
+    }
+    HostLog(kHostLogError, "OnCreateLeaderboard: Did not found leaderboard (handle = %d), %s",
+            static_cast<int32_t>(handle), ioFailure ? "IO failure detected" : "no errors detected");
+}
+
+void CreateCategoryClients(const ScoreClientLists& lists, const char* id, ELeaderboardSortMethod sort,
+                           ELeaderboardDisplayType display)
+{
+    auto* global = new SteamScoreClient();
+    auto* third = new SteamScoreClient();
+    auto* friends = new SteamScoreClient();
+    const SteamAPICall_t call = SteamUserStats()->FindOrCreateLeaderboard(id, sort, display);
+    for (SteamScoreClient* client : {global, third, friends})
+        FormatToBuffer(client->name, sizeof client->name, "%s", id);
+    global->filter = FilterGlobal;
+    lists.global->Add(global);
+    third->filter = FilterThird;
+    lists.third->Add(third);
+    friends->filter = FilterFriends;
+    lists.friends->Add(friends);
+    for (SteamScoreClient* client : {global, friends, third})
+        client->findResult.Set(call, client, &SteamScoreClient::OnCreateLeaderboard);
+}
+
+SteamScoreClient* FindClientIn(const ClientList& list, const char* category)
+{
+    if (category == nullptr)
+        return nullptr;
+    return list.FindFirst([category](const SteamScoreClient* client) {
+        return std::strcmp(client->name, category) == 0;
+    });
+}
