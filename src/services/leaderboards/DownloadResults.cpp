@@ -28,7 +28,8 @@ int32_t RaisedToZero(int32_t value)
     return value < 0 ? 0 : value;
 }
 
-void BuildRecord(ScoreEntry& record, const LeaderboardEntry_t& row, const int32_t* details, uint32_t waitStartMs)
+void BuildRecord(ScoreEntry& record, const LeaderboardEntry_t& row, const int32_t* details,
+                 uint32_t waitStartMs)
 {
     std::memset(&record, 0, sizeof record);
     record.score = RaisedToZero(row.m_nScore);
@@ -90,7 +91,8 @@ void ProcessResultsThread(void* argument)
     auto* results = static_cast<DownloadResults*>(argument);
     ScoreEntry* records = nullptr;
     if (results->count > 0)
-        records = static_cast<ScoreEntry*>(hostServices->Allocate(results->count * static_cast<int32_t>(sizeof(ScoreEntry))));
+        records = static_cast<ScoreEntry*>(
+            hostServices->Allocate(results->count * static_cast<int32_t>(sizeof(ScoreEntry))));
     const uint32_t waitStartMs = hostServices->GetTimeMs();
     for (int32_t i = 0; i < results->count; ++i) {
         if (records != nullptr)
@@ -128,11 +130,11 @@ void SendScoresEvent(const char* category, int32_t friends, int32_t start, int32
 
     const char* word = friends == 1 ? "FRIENDS" : friends == 0 ? "GLOBAL" : "ERROR";
     if (count >= 1)
-        HostLogInfo("Sending event with scores %d..%d (%d scores of %d) for category '%s' with filter '%s'", start,
-                    static_cast<int32_t>(int64_t{start} + count - 1), count, total, category, word);
+        HostLogInfo("Sending event with scores %d..%d (%d scores of %d) for category '%s' with filter '%s'",
+                    start, static_cast<int32_t>(int64_t{start} + count - 1), count, total, category, word);
     else
-        HostLogInfo("Sending event with no scores (%d scores in category) for category '%s' with filter '%s'", total,
-                    category, word);
+        HostLogInfo("Sending event with no scores (%d scores in category) for category '%s' with filter '%s'",
+                    total, category, word);
 
     HostEvent event;
     std::memcpy(&event, &scores, sizeof event);

@@ -200,7 +200,8 @@ void UserRequest::OnDownloadUser(LeaderboardScoresDownloaded_t* result, bool /*i
         SteamUserStats()->GetDownloadedLeaderboardEntry(result->m_hSteamLeaderboardEntries, 0, &row, block,
                                                         kScoreDetailsCount);
         if (record != nullptr) {
-            FormatToBuffer(record->userName, 63, "%s", SteamFriends()->GetFriendPersonaName(row.m_steamIDUser));
+            FormatToBuffer(record->userName, 63, "%s",
+                           SteamFriends()->GetFriendPersonaName(row.m_steamIDUser));
             FormatToBuffer(record->userId, 63, "%d", LowAccountBits(row.m_steamIDUser));
             record->score = row.m_nScore;
             record->rank = row.m_nGlobalRank;

@@ -50,7 +50,8 @@ void ReportCategoryNotFound(const char* category)
 
 ELeaderboardSortMethod SortMethodOf(const char* value)
 {
-    if (value != nullptr && (std::strcmp(value, "ASCENDING") == 0 || std::strcmp(value, "LOWEST_SCORE_FIRST") == 0))
+    if (value != nullptr &&
+        (std::strcmp(value, "ASCENDING") == 0 || std::strcmp(value, "LOWEST_SCORE_FIRST") == 0))
         return k_ELeaderboardSortMethodAscending;
     return k_ELeaderboardSortMethodDescending;
 }

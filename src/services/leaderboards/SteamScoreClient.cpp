@@ -8,6 +8,34 @@
 #include "services/leaderboards/ClientList.h"
 #include "services/leaderboards/LeaderboardsImplementation.h"
 
+namespace {
+
+// Clients live as long as the library. When it is unloaded, a find still pending
+// is cancelled, so the platform never calls into the unloaded code, and the
+// clients are freed. The configuration thread has long ended by then.
+struct MadeClients {
+    ~MadeClients()
+    {
+        SteamScoreClient* client = newest.exchange(nullptr);
+        while (client != nullptr) {
+            SteamScoreClient* next = client->nextMade;
+            client->findResult.Cancel();
+            delete client;
+            client = next;
+        }
+    }
+
+    void Add(SteamScoreClient* client)
+    {
+        client->nextMade = newest.load(std::memory_order_relaxed);
+        newest.store(client, std::memory_order_release);
+    }
+
+    std::atomic<SteamScoreClient*> newest{nullptr};
+} madeClients;
+
+}  // namespace
+
 void SteamScoreClient::OnCreateLeaderboard(LeaderboardFindResult_t* result, bool ioFailure)
 {
     const SteamLeaderboard_t handle = result->m_hSteamLeaderboard;
@@ -29,8 +57,10 @@ void CreateCategoryClients(const ScoreClientLists& lists, const char* id, ELeade
     auto* third = new SteamScoreClient();
     auto* friends = new SteamScoreClient();
     const SteamAPICall_t call = SteamUserStats()->FindOrCreateLeaderboard(id, sort, display);
-    for (SteamScoreClient* client : {global, third, friends})
+    for (SteamScoreClient* client : {global, third, friends}) {
+        madeClients.Add(client);
         FormatToBuffer(client->name, sizeof client->name, "%s", id);
+    }
     global->filter = FilterGlobal;
     lists.global->Add(global);
     third->filter = FilterThird;
@@ -45,7 +75,6 @@ SteamScoreClient* FindClientIn(const ClientList& list, const char* category)
 {
     if (category == nullptr)
         return nullptr;
-    return list.FindFirst([category](const SteamScoreClient* client) {
-        return std::strcmp(client->name, category) == 0;
-    });
+    return list.FindFirst(
+        [category](const SteamScoreClient* client) { return std::strcmp(client->name, category) == 0; });
 }

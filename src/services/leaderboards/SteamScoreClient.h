@@ -23,6 +23,8 @@ public:
     char name[32] = {};
     // Written once on the engine's thread, read by the queue threads.
     std::atomic<SteamLeaderboard_t> leaderboard{0};
+    // Every client made, newest first, so that an unload can release them all.
+    SteamScoreClient* nextMade = nullptr;
 };
 
 // The three client lists of the service, in filter order 0, 1, 2.
