@@ -70,7 +70,8 @@ public:
                                  std::move(rows));
         }
         xml += "</array></root>";
-        world.InjectFault("FindOrCreateLeaderboard", simclient::Fault::Result(k_EResultFail).Skip(kCategories - 1));
+        world.InjectFault("FindOrCreateLeaderboard",
+                          simclient::Fault::Result(k_EResultFail).Skip(kCategories - 1));
         engine.SetFeatureEnabled("LEADERBOARDS", true);
         engine.Files().AddMemoryFile("leaderboards/leaderboards.xml", xml);
         if (!loader.Load(STEAMEXT_MODULE_PATH) || !loader.Module()->Initialize(engine.Table()))

@@ -123,6 +123,7 @@ std::vector<std::unique_ptr<SteamScoreClient>> MakeClients(const std::vector<std
 TEST(LeaderboardRules, FindClientScansInOrderAcrossChunks)
 {
     std::vector<std::string> names;
+    names.reserve(200);
     for (int i = 0; i < 200; ++i)
         names.push_back("cat" + std::to_string(i % 150));  // the last 50 repeat earlier names
     auto clients = MakeClients(names);
