@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "data/HashedName.h"
 #include "host/HostServices.h"
 #include "services/leaderboards/ClientList.h"
 #include "services/leaderboards/DownloadResults.h"
@@ -121,6 +122,7 @@ std::vector<std::unique_ptr<SteamScoreClient>> MakeClients(const std::vector<std
     for (const std::string& name : names) {
         clients.push_back(std::make_unique<SteamScoreClient>());
         std::strncpy(clients.back()->name, name.c_str(), sizeof clients.back()->name - 1);
+        clients.back()->nameHash = HashText(clients.back()->name);
     }
     return clients;
 }
