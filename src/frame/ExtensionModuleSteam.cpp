@@ -8,6 +8,7 @@
 #include "services/achievements/AchievementImplementationSteam.h"
 #include "services/achievements/SteamAchievements.h"
 #include "services/cloud/CloudImplementationSteam.h"
+#include "services/leaderboards/SteamLeaderboardsImplementation.h"
 #include "services/store/InAppPurchaseSteam.h"
 
 const char* ExtensionModuleSteam::GetName()
@@ -60,11 +61,13 @@ BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumbe
     switch (serviceNumber) {
     case kServiceCloud:
         return cloud;
+    case kServiceLeaderboards:
+        return leaderboards;
     case kServiceAchievements:
         return achievements;
     case kServiceStore:
         return inAppPurchase;
-    // Leaderboards (2) and workshop (6) are not built yet: their
+    // Workshop (6) is not built yet: its
     // fields stay null, as before a successful Initialize.
     default:
         return nullptr;
@@ -76,6 +79,7 @@ void ExtensionModuleSteam::CreateServices()
     // Strictly in the order store, leaderboards, cloud, achievements, workshop,
     // each pointer stored as soon as its object exists.
     inAppPurchase = new InAppPurchaseSteam();
+    leaderboards = new SteamLeaderboardsImplementation();
     cloud = new CloudImplementationSteam();
     achievements = new AchievementImplementationSteam();
 }
