@@ -23,9 +23,8 @@ class Leaderboards : public SimWorld {
 protected:
     SteamLeaderboard_t Find(const char* name)
     {
-        auto found = Await<LeaderboardFindResult_t>(
-            SteamUserStats()->FindOrCreateLeaderboard(name, k_ELeaderboardSortMethodNone,
-                                                      k_ELeaderboardDisplayTypeNone));
+        auto found = Await<LeaderboardFindResult_t>(SteamUserStats()->FindOrCreateLeaderboard(
+            name, k_ELeaderboardSortMethodNone, k_ELeaderboardDisplayTypeNone));
         EXPECT_TRUE(found.m_bLeaderboardFound);
         return found.m_hSteamLeaderboard;
     }
@@ -134,8 +133,8 @@ TEST_F(Leaderboards, NamesOfAllPlayersArriveLateOrNever)
         world.Reset();
         ASSERT_TRUE(SteamAPI_Init());
         world.SetTimeSource([&nowMs] { return nowMs; });
-        world.AddGeneratedLeaderboard("gen", k_ELeaderboardSortMethodAscending, k_ELeaderboardDisplayTypeNumeric,
-                                      150, 3);
+        world.AddGeneratedLeaderboard("gen", k_ELeaderboardSortMethodAscending,
+                                      k_ELeaderboardDisplayTypeNumeric, 150, 3);
         c.setUp(world);
         const uint64 early = GeneratedPlayerId(10), late = GeneratedPlayerId(149);
         SteamAPI_RunCallbacks();  // reads the clock: the delays count from here
@@ -152,7 +151,8 @@ TEST_F(Leaderboards, NamesOfAllPlayersArriveLateOrNever)
             EXPECT_EQ(Ask(early, &missing), earlyKnown ? simclient::GeneratedPlayerName(10) : "[unknown]")
                 << "pump " << pump;
             EXPECT_EQ(missing, !earlyKnown);
-            EXPECT_EQ(Ask(late), lateKnown ? simclient::GeneratedPlayerName(149) : "[unknown]") << "pump " << pump;
+            EXPECT_EQ(Ask(late), lateKnown ? simclient::GeneratedPlayerName(149) : "[unknown]")
+                << "pump " << pump;
         }
         world.SetTimeSource({});
     }
@@ -162,12 +162,9 @@ TEST_F(Leaderboards, NamesOfAllPlayersArriveLateOrNever)
 TEST_F(Leaderboards, AwkwardNamesComeOutWhole)
 {
     const std::string names[] = {
-        std::string(63, 'a'),
-        std::string(64, 'b'),
-        std::string(300, 'c'),
-        "Zo\xC3\xAB",
-        "ends in a lead byte \xC3",
-        "ends in a three-byte lead \xE6",
+        std::string(63, 'a'),           std::string(64, 'b'),
+        std::string(300, 'c'),          "Zo\xC3\xAB",
+        "ends in a lead byte \xC3",     "ends in a three-byte lead \xE6",
         std::string(255, 'd') + "\xF0",
     };
     uint64 id = 76561197960265728ull + 500;
@@ -192,13 +189,17 @@ TEST_F(Leaderboards, EachCallKindFailsAsAsked)
     const std::map<std::string, std::function<SteamAPICall_t()>> calls = {
         {"FindOrCreateLeaderboard",
          [&] {
-             return us->FindOrCreateLeaderboard("b", k_ELeaderboardSortMethodNone, k_ELeaderboardDisplayTypeNone);
+             return us->FindOrCreateLeaderboard("b", k_ELeaderboardSortMethodNone,
+                                                k_ELeaderboardDisplayTypeNone);
          }},
         {"DownloadLeaderboardEntries",
          [&] { return us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 1, 1); }},
-        {"DownloadLeaderboardEntriesForUsers", [&] { return us->DownloadLeaderboardEntriesForUsers(board, &someone, 1); }},
+        {"DownloadLeaderboardEntriesForUsers",
+         [&] { return us->DownloadLeaderboardEntriesForUsers(board, &someone, 1); }},
         {"UploadLeaderboardScore",
-         [&] { return us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, 9, nullptr, 0); }},
+         [&] {
+             return us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, 9, nullptr, 0);
+         }},
     };
     for (const auto& [name, call] : calls) {
         SCOPED_TRACE(name);
@@ -259,8 +260,10 @@ TEST_F(Leaderboards, LatencyReordersResultsRepeatably)
     };
     Tagged first{&order, 1}, second{&order, 2};
     CCallResult<Tagged, LeaderboardScoresDownloaded_t> r1, r2;
-    r1.Set(us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 1, 5), &first, &Tagged::OnResult);
-    r2.Set(us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 6, 9), &second, &Tagged::OnResult);
+    r1.Set(us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 1, 5), &first,
+           &Tagged::OnResult);
+    r2.Set(us->DownloadLeaderboardEntries(board, k_ELeaderboardDataRequestGlobal, 6, 9), &second,
+           &Tagged::OnResult);
     for (int i = 0; i < 4; ++i)
         SteamAPI_RunCallbacks();
     EXPECT_EQ(order, (std::vector<int>{2, 1}));
@@ -271,8 +274,8 @@ TEST_F(Leaderboards, LatencyReordersResultsRepeatably)
         world.InjectFault("UploadLeaderboardScore", Fault::ZeroHandle().Chance(30).Always());
         std::string hits;
         for (int i = 0; i < 300; ++i)
-            hits += us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, i, nullptr, 0) ==
-                            k_uAPICallInvalid
+            hits += us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, i, nullptr,
+                                               0) == k_uAPICallInvalid
                         ? 'x'
                         : '.';
         return hits;
@@ -331,7 +334,8 @@ TEST_F(Leaderboards, FiveKindsOfThreadsAtOnce)
     });
     threads.emplace_back([&] {
         for (int i = 0; i < kCalls; ++i)
-            SteamUserStats()->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, i, nullptr, 0);
+            SteamUserStats()->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, i,
+                                                     nullptr, 0);
         --running;
     });
     threads.emplace_back([&] {
@@ -339,7 +343,8 @@ TEST_F(Leaderboards, FiveKindsOfThreadsAtOnce)
             const CSteamID id(GeneratedPlayerId(p));
             while (SteamFriends()->RequestUserInformation(id, true))
                 std::this_thread::yield();
-            namesKnown += std::string(SteamFriends()->GetFriendPersonaName(id)) == simclient::GeneratedPlayerName(p);
+            namesKnown +=
+                std::string(SteamFriends()->GetFriendPersonaName(id)) == simclient::GeneratedPlayerName(p);
         }
         --running;
     });

@@ -1,9 +1,12 @@
 // "steamext data check FILE...": each file loaded as the module would, popups
 // answered "give up"; the module's messages as they reach the engine, then one
-// verdict line per file. Exit 1 if a file failed to load, 2 if one was unreadable.
+// verdict line per file. Beside them the tool's own warnings (DataWarnings.h) about what
+// the module would quietly ignore. Exit 1 if a file failed to load (or, with --strict,
+// had warnings), 2 if one was unreadable.
 #include <iostream>
 
 #include "data/DataTool.h"
+#include "data/DataWarnings.h"
 
 namespace datatool {
 
@@ -11,6 +14,7 @@ namespace {
 
 struct CheckOptions {
     std::vector<std::string> files;
+    bool strict = false;
 };
 
 const char* KindName(const simengine::LogLine& line)
@@ -55,8 +59,16 @@ int RunCheck(const CheckOptions& options)
             ++arrays;
             nodes += array->nodes.count;
         }
-        if (outcome.loaded) {
-            std::cout << file << ": ok (" << arrays << " arrays, " << nodes << " nodes)\n";
+        const int warnings = outcome.loaded ? PrintDataWarnings(file, bytes, std::cout) : 0;
+        if (outcome.loaded && warnings > 0 && options.strict) {
+            std::cout << file << ": FAILED under --strict (" << warnings << " warnings)\n";
+            if (status == 0)
+                status = 1;
+        } else if (outcome.loaded) {
+            std::cout << file << ": ok (" << arrays << " arrays, " << nodes << " nodes)";
+            if (warnings > 0)
+                std::cout << ", " << warnings << " warnings";
+            std::cout << "\n";
         } else {
             std::cout << file << ": FAILED to load\n";
             if (status == 0)
@@ -74,6 +86,7 @@ void AddCheckCommand(CLI::App& data, SubcommandAction& action)
     CLI::App* check =
         data.add_subcommand("check", "Load each file as the module would and report what it says");
     check->add_option("files", options->files, "Data files (.xml, .dat, .csv)")->required();
+    check->add_flag("--strict", options->strict, "Fail a file that has warnings");
     check->callback([options, &action] { action = [options] { return RunCheck(*options); }; });
 }
 

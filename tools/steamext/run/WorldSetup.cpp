@@ -2,6 +2,8 @@
 
 #include <simclient/World.h>
 
+#include "run/WorldLeaderboards.h"
+
 namespace steamext::run {
 
 using nlohmann::json;
@@ -39,6 +41,7 @@ const FaultKind kFaultKinds[] = {
     {"extra_latency", simclient::Fault::Kind::ExtraLatency, true},
     {"short_read", simclient::Fault::Kind::ShortRead, true},
     {"drop", simclient::Fault::Kind::Drop, false},
+    {"random_latency", simclient::Fault::Kind::RandomLatency, true},
 };
 
 std::string Shown(const json& value)
@@ -116,7 +119,7 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
     for (std::size_t i = 0; i < value.size(); ++i) {
         const std::string at = ScenarioFile::Child(pointer, i);
         const json& entry = r.Object(value[i], at);
-        r.OnlyKeys(entry, at, {"call", "kind", "value", "skip", "times"});
+        r.OnlyKeys(entry, at, {"call", "kind", "value", "skip", "times", "chance"});
         if (!entry.contains("call") || !entry.contains("kind"))
             r.Fail(at, "a fault needs \"call\" (the platform call's name) and \"kind\"");
         std::string call = r.String(entry["call"], ScenarioFile::Child(at, "call"));
@@ -150,6 +153,8 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
             fault.skip = r.Int(entry["skip"], ScenarioFile::Child(at, "skip"), 0);
         if (entry.contains("times"))
             fault.times = r.Int(entry["times"], ScenarioFile::Child(at, "times"), 0);
+        if (entry.contains("chance"))
+            fault.chance = r.Int(entry["chance"], ScenarioFile::Child(at, "chance"), 1, 100);
         faults.emplace_back(call, fault);
     }
     return {"faults " + Shown(value), [faults](World& w) {
@@ -195,6 +200,11 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
                                                    "stats_received_result",
                                                    "stats_stored_result",
                                                    "cloud_files",
+                                                   "leaderboards",
+                                                   "friends",
+                                                   "personas",
+                                                   "all_names_arrive",
+                                                   "fault_seed",
                                                    "clear_faults",
                                                    "faults",
                                                    "overlay_active",
@@ -265,6 +275,17 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
             edits.push_back(ParseStatsResult(r, value, at, key == "stats_received_result"));
         } else if (key == "cloud_files") {
             edits.push_back(ParseCloudFiles(r, value, at));
+        } else if (key == "leaderboards") {
+            edits.push_back(ParseLeaderboards(r, value, at));
+        } else if (key == "friends") {
+            edits.push_back(ParseFriends(r, value, at));
+        } else if (key == "personas") {
+            edits.push_back(ParsePersonas(r, value, at));
+        } else if (key == "all_names_arrive") {
+            edits.push_back(ParseAllNames(r, value, at));
+        } else if (key == "fault_seed") {
+            uint64 seed = r.UInt64(value, at);
+            edits.push_back({shown, [seed](World& w) { w.SetFaultSeed(seed); }});
         } else if (key == "faults") {
             edits.push_back(ParseFaults(r, value, at));
         } else if (key == "clear_faults") {
