@@ -83,7 +83,7 @@ void CCallbackMgr::RegisterCallResult(CCallbackBase* cb, SteamAPICall_t handle)
     s.Record(SIM_CALL("SteamAPI_RegisterCallResult"), Args(handle));
     if (!cb || handle == k_uAPICallInvalid)
         return;
-    s.callResults[handle] = cb;
+    s.callResults.emplace(handle, cb);
 }
 
 void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle)
@@ -91,9 +91,13 @@ void CCallbackMgr::UnregisterCallResult(CCallbackBase* cb, SteamAPICall_t handle
     WorldState& s = State();
     std::lock_guard<std::mutex> lock(s.mutex);
     s.Record(SIM_CALL("SteamAPI_UnregisterCallResult"), Args(handle));
-    auto found = s.callResults.find(handle);
-    if (found != s.callResults.end() && found->second == cb)
-        s.callResults.erase(found);
+    auto bound = s.callResults.equal_range(handle);
+    for (auto found = bound.first; found != bound.second; ++found) {
+        if (found->second == cb) {
+            s.callResults.erase(found);
+            break;
+        }
+    }
 }
 
 void CCallbackMgr::RunCallbacks()
@@ -136,16 +140,16 @@ void CCallbackMgr::RunCallbacks()
     t_dispatching = true;
     for (Pending& item : due) {
         if (item.handle != k_uAPICallInvalid) {
-            CCallbackBase* target = nullptr;
+            std::vector<CCallbackBase*> targets;
             {
                 std::lock_guard<std::mutex> lock(s.mutex);
-                auto found = s.callResults.find(item.handle);
-                if (found != s.callResults.end()) {
-                    target = found->second;
-                    s.callResults.erase(found);  // the dispatcher, not the object, drops the binding
-                }
+                auto bound = s.callResults.equal_range(item.handle);
+                for (auto found = bound.first; found != bound.second; ++found)
+                    targets.push_back(found->second);
+                s.callResults.erase(bound.first,
+                                    bound.second);  // the dispatcher, not the object, drops the bindings
             }
-            if (target) {
+            for (CCallbackBase* target : targets) {
                 std::vector<uint8> buffer(item.payload);
                 buffer.resize(std::max<std::size_t>(buffer.size(), target->GetCallbackSizeBytes()));
                 target->Run(buffer.data(), item.ioFailure, item.handle);

@@ -208,7 +208,8 @@ struct WorldState : WorldData {
 
     // Kept by Reset (see World::Reset).
     std::map<int, std::vector<CCallbackBase*>> callbacks;  // by number, in registration order
-    std::map<SteamAPICall_t, CCallbackBase*> callResults;
+    // One call may be bound to several objects; they run in the order they were bound.
+    std::multimap<SteamAPICall_t, CCallbackBase*> callResults;
     SteamAPICall_t nextHandle = 0x100;
     SteamLeaderboardEntries_t nextEntriesHandle = 1;
     UGCQueryHandle_t nextQueryHandle = 1;

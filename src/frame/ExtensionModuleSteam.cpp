@@ -8,6 +8,7 @@
 #include "services/achievements/AchievementImplementationSteam.h"
 #include "services/achievements/SteamAchievements.h"
 #include "services/cloud/CloudImplementationSteam.h"
+#include "services/leaderboards/SteamLeaderboardsImplementation.h"
 
 const char* ExtensionModuleSteam::GetName()
 {
@@ -57,9 +58,11 @@ BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumbe
     switch (serviceNumber) {
     case kServiceCloud:
         return cloud;
+    case kServiceLeaderboards:
+        return leaderboards;
     case kServiceAchievements:
         return achievements;
-    // Store (4), leaderboards (2) and workshop (6) are not built yet: their
+    // Store (4) and workshop (6) are not built yet: their
     // fields stay null, as before a successful Initialize.
     default:
         return nullptr;
@@ -70,6 +73,7 @@ void ExtensionModuleSteam::CreateServices()
 {
     // Strictly in the order store, leaderboards, cloud, achievements, workshop,
     // each pointer stored as soon as its object exists.
+    leaderboards = new SteamLeaderboardsImplementation();
     cloud = new CloudImplementationSteam();
     achievements = new AchievementImplementationSteam();
 }

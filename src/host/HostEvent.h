@@ -8,6 +8,8 @@
 #include <cstddef>
 #include <cstdint>
 
+struct ScoreEntry;
+
 struct HostEvent {
     int32_t type;
     int32_t status;
@@ -37,3 +39,27 @@ struct StartupEvent {
 static_assert(sizeof(StartupEvent) == sizeof(HostEvent), "a view covers the whole event");
 static_assert(offsetof(StartupEvent, PlayerId) == 8, "PlayerId at 8");
 static_assert(offsetof(StartupEvent, ErrorText) == 16, "ErrorText at 16");
+
+// Type 19: the rows of one score download.
+struct ScoresEvent {
+    int32_t type;
+    int32_t status;  // always 1
+    int64_t unused1;
+    char* category;  // from Allocate; null if that failed
+    int32_t total;   // rows of the whole board for the global filter, else of this result
+    int32_t filter;  // 1 for the friends filter, 0 for every other
+    int32_t start;   // rank of the first row; 0 when there are no rows
+    int32_t count;
+    ScoreEntry* entries;  // `count` records from Allocate; null when count is 0
+    unsigned char unused2[24];
+};
+static_assert(sizeof(ScoresEvent) == sizeof(HostEvent), "a view covers the whole event");
+static_assert(offsetof(ScoresEvent, status) == 4, "status at 4");
+static_assert(offsetof(ScoresEvent, unused1) == 8, "eight zero bytes at 8");
+static_assert(offsetof(ScoresEvent, category) == 16, "category at 16");
+static_assert(offsetof(ScoresEvent, total) == 24, "total at 24");
+static_assert(offsetof(ScoresEvent, filter) == 28, "filter at 28");
+static_assert(offsetof(ScoresEvent, start) == 32, "start at 32");
+static_assert(offsetof(ScoresEvent, count) == 36, "count at 36");
+static_assert(offsetof(ScoresEvent, entries) == 40, "entries at 40");
+static_assert(offsetof(ScoresEvent, unused2) == 48, "24 zero bytes at 48");
