@@ -34,7 +34,7 @@ GeneratedPlayers GeneratePlayers(int count, uint64 seed)
         row.score = static_cast<int32>(low + static_cast<int64_t>(random() % span));
         row.details.resize(random() % (k_cLeaderboardDetailsMax + 1));
         for (int32& value : row.details)
-            value = static_cast<int32>(static_cast<uint32>(random()));
+            value = static_cast<int32>(random() % 2000) - 1000;
         players.rows.push_back(std::move(row));
         players.names.push_back(GeneratedPlayerName(i));
     }

@@ -54,12 +54,14 @@ TEST(LeaderboardRules, PlainTextOfNames)
     };
     const Row rows[] = {
         {"Zo\xC3\xAB", "Zo "},
-        {"a\xE2\x82\xAC" "b", "a b"},
+        {"a\xE2\x82\xAC"
+         "b",
+         "a b"},
         {"\xF0\x9F\x98\x80!", " !"},
-        {"x\x80y", "x\x80y"},            // a lone continuation byte stays
-        {"end\xC3", "end "},             // lead byte as the very last byte
-        {"end\xF0\x9F", "end "},         // a sequence cut short by the end
-        {"\xFF\xFE", "\xFF\xFE"},        // not lead bytes of the three forms
+        {"x\x80y", "x\x80y"},      // a lone continuation byte stays
+        {"end\xC3", "end "},       // lead byte as the very last byte
+        {"end\xF0\x9F", "end "},   // a sequence cut short by the end
+        {"\xFF\xFE", "\xFF\xFE"},  // not lead bytes of the three forms
         {"", ""},
     };
     for (const Row& row : rows) {

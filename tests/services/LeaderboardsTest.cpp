@@ -75,8 +75,8 @@ TEST_F(LeaderboardTest, StartsMutexesUserIdAndThreadsInOrder)
     std::vector<std::string> names;
     for (const auto& start : engine.Records().All().ThreadStarts())
         names.push_back(start.name);
-    const std::vector<std::string> expected = {"SteamStats_Updater", kConfigThread, kRequestThread, kSubmitThread,
-                                               kUserThread};
+    const std::vector<std::string> expected = {"SteamStats_Updater", kConfigThread, kRequestThread,
+                                               kSubmitThread, kUserThread};
     EXPECT_EQ(names, expected);
     EXPECT_STREQ(service->GetUserId(), "1234");
     EXPECT_EQ(engine.Mutexes().Counts("STEAM_LEADERBOARDS_REQUEST").creates, 1);
@@ -124,7 +124,9 @@ TEST_F(LeaderboardTest, ConfigurationFailuresAndTheirMessages)
         {"feature off", false, "<root><array id=\"CATEGORIES\"><node id=\"A\"/></array></root>", {}, 0},
         {"no CATEGORIES", true, "<root><array id=\"OTHER\"><node id=\"A\"/></array></root>", {missing}, 0},
         {"empty CATEGORIES", true, "<root><array id=\"CATEGORIES\"></array></root>", {}, 0},
-        {"node without id", true, "<root><array id=\"CATEGORIES\"><node sort=\"x\"/><node id=\"A\"/></array></root>",
+        {"node without id",
+         true,
+         "<root><array id=\"CATEGORIES\"><node sort=\"x\"/><node id=\"A\"/></array></root>",
          {},
          1},
     };
@@ -156,13 +158,15 @@ TEST_F(LeaderboardTest, FindLogsOneLinePerClient)
     world.InjectFault("FindOrCreateLeaderboard", simclient::Fault::IoFailure().Skip(1));
     world.InjectFault("FindOrCreateLeaderboard", simclient::Fault::ZeroHandle().Skip(2));
     StartService(ConfigWith({"id=\"Good\"", "id=\"Broken\"", "id=\"Lost\""}));
-    const std::string found = "OnCreateLeaderboard: Found leaderboard (handle = 1, name = Good), no errors detected";
-    const std::string failed = "OnCreateLeaderboard: Did not found leaderboard (handle = 2), IO failure detected";
+    const std::string found =
+        "OnCreateLeaderboard: Found leaderboard (handle = 1, name = Good), no errors detected";
+    const std::string failed =
+        "OnCreateLeaderboard: Did not found leaderboard (handle = 2), IO failure detected";
     std::vector<std::string> lines;
     for (const auto& line : engine.Records().All().Logs(simengine::LogKind::Log))
         if (line.text.rfind("OnCreateLeaderboard", 0) == 0)
             lines.push_back(std::to_string(line.level) + " " + line.text);
-    const std::vector<std::string> expected = {"0 " + found, "0 " + found, "0 " + found,
+    const std::vector<std::string> expected = {"0 " + found,  "0 " + found,  "0 " + found,
                                                "2 " + failed, "2 " + failed, "2 " + failed};
     EXPECT_EQ(lines, expected);
     EXPECT_EQ(world.BoundCallResultCount(), 0u);

@@ -292,7 +292,7 @@ TEST_F(LeaderboardTest, UnloadReleasesWhatIsQueuedOrInFlight)
     AddBoard("Busy", 4);
     StartService(ConfigWith({"id=\"Busy\""}));
     EXPECT_TRUE(service->RequestScores(1, 4, 0, "Busy"));
-    ServeQueues();  // in flight
+    ServeQueues();                                         // in flight
     EXPECT_TRUE(service->RequestScores(1, 4, 1, "Busy"));  // queued
     ScoreEntry record{};
     service->SubmitScore(0, &record, "Busy");

@@ -6,7 +6,7 @@
 // that depends on the id alone. The seed chooses the scores and the details:
 // - scores from -(count / 4 + 1) to count / 2, so that a board holds negative scores and,
 //   from a handful of rows on, ties;
-// - 0 to 64 details of any 32-bit value.
+// - 0 to 64 details, each from -1000 to 999 (short enough to read in a timeline).
 // Names: mostly "Player <i>"; every fifth "Zoë <i>" (two-byte letter), every fifth "東京 <i>"
 // (three-byte letters), and every fiftieth a name of 80 bytes (beyond the 63 a row keeps).
 #ifndef SIMCLIENT_GENERATED_PLAYERS_H

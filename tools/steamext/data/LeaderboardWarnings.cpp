@@ -108,8 +108,8 @@ private:
         if (id == nullptr || std::strcmp(id, "CATEGORIES") != 0)
             return;
         if (categoriesLine != 0) {
-            Warn(line, "a second array \"CATEGORIES\" (the first is on line " + std::to_string(categoriesLine) +
-                           "): its categories are never read");
+            Warn(line, "a second array \"CATEGORIES\" (the first is on line " +
+                           std::to_string(categoriesLine) + "): its categories are never read");
             return;
         }
         categoriesLine = line;

@@ -49,7 +49,7 @@ struct EngineSetup {
 
 // What a step waits for: a record of one kind matching a pattern.
 struct WaitCondition {
-    std::string kind;  // "event", "log", "platform_call"
+    std::string kind;  // "event", "log", "platform_call", "threads_ended" (pattern {"name": ...})
     nlohmann::json pattern;
     std::string description;
 };

@@ -287,9 +287,9 @@ void ParseExpectations(const R& r, const json& step, const std::string& at, cons
 WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
 {
     r.Object(value, at);
-    r.OnlyKeys(value, at, {"event", "log", "platform_call"});
+    r.OnlyKeys(value, at, {"event", "log", "platform_call", "threads_ended"});
     if (value.size() != 1)
-        r.Fail(at, "wait for exactly one thing: \"event\", \"log\" or \"platform_call\"");
+        r.Fail(at, "wait for exactly one thing: \"event\", \"log\", \"platform_call\" or \"threads_ended\"");
     WaitCondition wait;
     wait.kind = value.begin().key();
     const std::string p = R::Child(at, wait.kind);
@@ -297,6 +297,10 @@ WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
     if (wait.kind == "event") {
         wait.pattern = what.is_number_integer() ? json{{"type", r.Int(what, p)}} : r.Object(what, p);
         wait.description = "event " + wait.pattern.dump();
+    } else if (wait.kind == "threads_ended") {
+        // Every thread of this name that the module started has ended (and it started one).
+        wait.pattern = json{{"name", r.String(what, p)}};
+        wait.description = "the end of the threads \"" + wait.pattern["name"].get<std::string>() + "\"";
     } else if (wait.kind == "log") {
         wait.pattern = ParsePattern(r, what, p, "text", kLogKeys, false);
         wait.description = "log line " + wait.pattern.dump();

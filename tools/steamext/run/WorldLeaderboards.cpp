@@ -50,7 +50,8 @@ uint64 PlayerId(const ScenarioFile& r, const json& value, const std::string& at)
         r.OnlyKeys(value, at, {"generated"});
         if (!value.contains("generated"))
             r.Fail(at, "a player is an id, or {\"generated\": n} for generated player n");
-        return simclient::GeneratedPlayerId(r.Int(value["generated"], ScenarioFile::Child(at, "generated"), 0));
+        return simclient::GeneratedPlayerId(
+            r.Int(value["generated"], ScenarioFile::Child(at, "generated"), 0));
     }
     return r.UInt64(value, at);
 }
@@ -61,7 +62,8 @@ std::optional<simclient::Delay> Arrival(const ScenarioFile& r, const json& value
 {
     if (value.is_string()) {
         if (value.get_ref<const std::string&>() != "never")
-            r.Fail(at, "expected {\"pumps\": n}, {\"ms\": n} or \"never\", got " + ScenarioFile::Describe(value));
+            r.Fail(at,
+                   "expected {\"pumps\": n}, {\"ms\": n} or \"never\", got " + ScenarioFile::Describe(value));
         return std::nullopt;
     }
     r.Object(value, at);
@@ -136,7 +138,8 @@ WorldEdit ParseLeaderboards(const ScenarioFile& r, const json& value, const std:
             r.OnlyKeys(generated, genAt, {"count", "seed"});
             if (!generated.contains("count"))
                 r.Fail(genAt, "generated rows need \"count\"");
-            board.generatedCount = r.Int(generated["count"], ScenarioFile::Child(genAt, "count"), 0, 10000000);
+            board.generatedCount =
+                r.Int(generated["count"], ScenarioFile::Child(genAt, "count"), 0, 10000000);
             if (generated.contains("seed"))
                 board.seed = r.UInt64(generated["seed"], ScenarioFile::Child(genAt, "seed"));
         }

@@ -11,7 +11,8 @@
 
 namespace steamext::run {
 
-WorldEdit ParseLeaderboards(const ScenarioFile& reader, const nlohmann::json& value, const std::string& pointer);
+WorldEdit ParseLeaderboards(const ScenarioFile& reader, const nlohmann::json& value,
+                            const std::string& pointer);
 WorldEdit ParseFriends(const ScenarioFile& reader, const nlohmann::json& value, const std::string& pointer);
 WorldEdit ParsePersonas(const ScenarioFile& reader, const nlohmann::json& value, const std::string& pointer);
 WorldEdit ParseAllNames(const ScenarioFile& reader, const nlohmann::json& value, const std::string& pointer);
