@@ -245,6 +245,8 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
          "steps[0].wait_for.threads_ended: expected a string"},
         {R"({"steps": [{"call": "leaderboards.SubmitScore", "args": [0, {"scor": 1}, "B"]}]})",
          "steps[0].args[1].scor: the score record has no field \"scor\""},
+        {R"({"steps": [{"fail_allocations": 0}]})",
+         "steps[0].fail_allocations: the integer 0 is out of range"},
         {"[1, 2]", "t.json:1:1: (top level): expected an object"},
         {"", "t.json:1:1: not valid JSON"},
     };

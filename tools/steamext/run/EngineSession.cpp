@@ -247,6 +247,11 @@ void EngineSession::SettleThreads()
         Settle();
 }
 
+void EngineSession::FailAllocations(int count)
+{
+    state_->engine.Memory().FailNextAllocations(count);
+}
+
 void EngineSession::Settle()
 {
     // With the manual clock, time must not move while a thread of the module

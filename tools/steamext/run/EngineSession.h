@@ -59,6 +59,8 @@ public:
     // the clock: what a call or a world change sets off lands in its own step (a thread the
     // call started, an entry a queue's thread takes). Nothing with the scaled clock.
     void SettleThreads();
+    // The engine's next `count` Allocate calls, on any thread, give null.
+    void FailAllocations(int count);
     // A platform call made on the calling thread, for telling polls from work;
     // the simulated client's call observer feeds it.
     static void NotePlatformCall(const char* name, const std::string& args);

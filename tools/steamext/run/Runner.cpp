@@ -119,6 +119,13 @@ private:
         case StepKind::Read:
             result = Read(step);
             break;
+        case StepKind::FailAllocations:
+            timeline_.Step(Now(), step.index,
+                           "the engine's next " + std::to_string(step.failAllocations) +
+                               " Allocate call(s) give null",
+                           step.note, {{"action", "fail_allocations"}, {"count", step.failAllocations}});
+            engine_->FailAllocations(step.failAllocations);
+            break;
         case StepKind::World: {
             std::string what;
             for (const auto& edit : step.world)
