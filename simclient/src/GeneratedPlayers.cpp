@@ -25,7 +25,8 @@ GeneratedPlayers GeneratePlayers(int count, uint64 seed)
     // values are taken by modulo.
     std::mt19937_64 random(seed);
     const int64_t low = -(count / 4 + 1);
-    const auto span = static_cast<uint64>(count / 2 - low + 1);
+    const int64_t width = count / 2 - low + 1;
+    const auto span = static_cast<uint64>(width);
     players.rows.reserve(static_cast<std::size_t>(count));
     players.names.reserve(static_cast<std::size_t>(count));
     for (int i = 0; i < count; ++i) {

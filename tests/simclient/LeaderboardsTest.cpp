@@ -201,7 +201,9 @@ TEST_F(Leaderboards, EachCallKindFailsAsAsked)
              return us->UploadLeaderboardScore(board, k_ELeaderboardUploadScoreMethodKeepBest, 9, nullptr, 0);
          }},
     };
-    for (const auto& [name, call] : calls) {
+    for (const auto& entry : calls) {
+        const std::string& name = entry.first;
+        const std::function<SteamAPICall_t()>& call = entry.second;
         SCOPED_TRACE(name);
         world.InjectFault(name, Fault::ZeroHandle());
         EXPECT_EQ(call(), k_uAPICallInvalid);
