@@ -128,7 +128,9 @@ void CCallbackMgr::RunCallbacks()
         for (Scheduled& action : s.TakeDueActions(clock != nullptr))
             action.action(s);
         for (auto it = s.queue.begin(); it != s.queue.end();) {
-            if (it->dueAtPump <= s.pump) {
+            const bool waitsForBinding = s.holdUnboundResults && it->handle != k_uAPICallInvalid &&
+                                         s.callResults.count(it->handle) == 0;
+            if (it->dueAtPump <= s.pump && !waitsForBinding) {
                 due.push_back(std::move(*it));
                 it = s.queue.erase(it);
             } else {

@@ -128,6 +128,11 @@ void World::SetLatency(int pumps)
     auto l = Lock();
     State().latency = pumps < 1 ? 1 : pumps;
 }
+void World::SetHoldUnboundResults(bool hold)
+{
+    auto l = Lock();
+    State().holdUnboundResults = hold;
+}
 void World::PostCallback(int callbackId, const void* data, std::size_t size)
 {
     auto l = Lock();

@@ -125,6 +125,7 @@ struct WorldData {
 
     // Dispatch and schedule
     int latency = 1;
+    bool holdUnboundResults = false;  // World::SetHoldUnboundResults
     uint64 pump = 0;
     uint64 engineMs = 0;  // engine time read at the latest pump
     std::deque<Pending> queue;

@@ -116,6 +116,11 @@ public:
     // --- Callbacks --------------------------------------------------------------------------
     // Pumps a posted callback or call result waits (1 = the next RunCallbacks).
     void SetLatency(int pumps);
+    // On: a call result that falls due before any object is bound to its handle waits
+    // for the binding, as on the real platform, where no answer comes back within the
+    // moment between a call and its CCallResult::Set. Off (the default, and after
+    // Reset): it is released unseen at its pump. For soaks that pump without pause.
+    void SetHoldUnboundResults(bool hold);
     // Queue a broadcast callback for every registered object of number `callbackId`.
     void PostCallback(int callbackId, const void* data, std::size_t size);
     template <class T> void Post(const T& data) { PostCallback(T::k_iCallback, &data, sizeof(T)); }

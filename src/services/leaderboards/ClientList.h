@@ -28,13 +28,16 @@ public:
     template <typename Visit> SteamScoreClient* FindFirst(Visit visit) const
     {
         int32_t remaining = Count();
-        for (const Chunk* chunk = &first; chunk != nullptr && remaining > 0; chunk = chunk->next) {
+        const Chunk* chunk = &first;
+        while (remaining > 0) {
             const int32_t inChunk = remaining < kChunkSize ? remaining : kChunkSize;
             for (int32_t i = 0; i < inChunk; ++i) {
                 if (visit(chunk->clients[i]))
                     return chunk->clients[i];
             }
             remaining -= inChunk;
+            if (remaining > 0)
+                chunk = chunk->next;  // linked before the count that reaches into it
         }
         return nullptr;
     }
