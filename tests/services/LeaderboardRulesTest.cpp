@@ -7,11 +7,17 @@
 #include <string>
 #include <vector>
 
+#include "data/HashedName.h"
+#include "host/HostServices.h"
 #include "services/leaderboards/ClientList.h"
 #include "services/leaderboards/DownloadResults.h"
+#include "services/leaderboards/LeaderboardQueues.h"
+#include "services/leaderboards/ScoreEntry.h"
 #include "services/leaderboards/ScoreRequest.h"
 #include "services/leaderboards/SteamLeaderboardsImplementation.h"
 #include "services/leaderboards/SteamScoreClient.h"
+#include "simclient/World.h"
+#include "simengine/Engine.h"
 
 namespace {
 
@@ -116,6 +122,7 @@ std::vector<std::unique_ptr<SteamScoreClient>> MakeClients(const std::vector<std
     for (const std::string& name : names) {
         clients.push_back(std::make_unique<SteamScoreClient>());
         std::strncpy(clients.back()->name, name.c_str(), sizeof clients.back()->name - 1);
+        clients.back()->nameHash = HashText(clients.back()->name);
     }
     return clients;
 }
@@ -123,6 +130,7 @@ std::vector<std::unique_ptr<SteamScoreClient>> MakeClients(const std::vector<std
 TEST(LeaderboardRules, FindClientScansInOrderAcrossChunks)
 {
     std::vector<std::string> names;
+    names.reserve(200);
     for (int i = 0; i < 200; ++i)
         names.push_back("cat" + std::to_string(i % 150));  // the last 50 repeat earlier names
     auto clients = MakeClients(names);
@@ -140,6 +148,69 @@ TEST(LeaderboardRules, FindClientScansInOrderAcrossChunks)
     EXPECT_EQ(service.FindClient("CAT3", 0), nullptr);
     EXPECT_EQ(service.FindClient(nullptr, 0), nullptr);
     EXPECT_EQ(service.FindClient("cat150", 0), nullptr);
+}
+
+// Nothing in the engine's table feeds the user queue; its thread and handler are
+// driven here directly, in this process, on the manual clock.
+TEST(LeaderboardRules, UserDownloadPostsOneRecordWithOrWithoutARow)
+{
+    simclient::World& world = simclient::GetWorld();
+    simengine::Engine& engine = simengine::Engine::Instance();
+    world.Reset();
+    engine.Reset();
+    world.SetAppId(480);
+    world.SetLocalUser(0x0110000100000000ull + 1, true, "Me");
+    const CSteamID ranked(0x0110000100000000ull + 5);
+    const CSteamID unranked(0x0110000100000000ull + 0xFFFFFFFFull);
+    world.SetPersonaName(ranked.ConvertToUint64(), "Fiv\xC3\xAB");
+    world.SetPersonaName(unranked.ConvertToUint64(), "Nobody");
+    world.AddLeaderboard("U", k_ELeaderboardSortMethodDescending, k_ELeaderboardDisplayTypeNumeric,
+                         {{0x0110000100000000ull + 2, 99, {}, k_UGCHandleInvalid},
+                          {ranked.ConvertToUint64(), -42, {3, 4}, k_UGCHandleInvalid}});
+    hostServices = engine.Table();
+    ASSERT_TRUE(SteamAPI_Init());
+    requestMutex = hostServices->threads->CreateMutex("STEAM_LEADERBOARDS_REQUEST");
+    SteamScoreClient client;
+    client.filter = 2;
+    std::strcpy(client.name, "U");
+    client.leaderboard.store(1);
+    hostServices->threads->StartThread("Steam_Leaderboards_RequestUser", &RequestUserThread, nullptr, 0);
+    ASSERT_TRUE(engine.Time().WaitUntilSleeping("Steam_Leaderboards_RequestUser"));
+    QueueUserRequest(&client, ranked);
+    QueueUserRequest(&client, unranked);
+    engine.Time().Advance(1);
+    ASSERT_TRUE(engine.Time().WaitUntilSleeping("Steam_Leaderboards_RequestUser"));
+    SteamAPI_RunCallbacks();
+    engine.QuitAndJoin();
+
+    const auto events = engine.Records().All().Events(19);
+    ASSERT_EQ(events.size(), 2u);
+    const simengine::ScoresFields& withRow = *events[0].scores;
+    EXPECT_EQ(withRow.category, "U");
+    EXPECT_EQ(withRow.filter, 0);
+    EXPECT_EQ(withRow.start, 2);  // the row's rank, for a filter other than 1
+    EXPECT_EQ(withRow.count, 1);
+    EXPECT_EQ(withRow.total, 2);
+    ASSERT_EQ(withRow.rows.size(), 1u);
+    EXPECT_EQ(withRow.rows[0].userName, "Fiv\xC3\xAB");  // no plain-text conversion here
+    EXPECT_EQ(withRow.rows[0].userId, "5");
+    EXPECT_EQ(withRow.rows[0].score, -42);  // unchanged
+    EXPECT_EQ(withRow.rows[0].rank, 2);
+    EXPECT_EQ(withRow.rows[0].detailsSize, 188);
+    EXPECT_EQ(withRow.rows[0].details[4], 4);
+    const simengine::ScoresFields& withoutRow = *events[1].scores;
+    EXPECT_EQ(withoutRow.start, 1);
+    EXPECT_EQ(withoutRow.count, 1);
+    ASSERT_EQ(withoutRow.rows.size(), 1u);
+    EXPECT_EQ(withoutRow.rows[0].userName, "Nobody");
+    EXPECT_EQ(withoutRow.rows[0].userId, "-1");
+    EXPECT_EQ(withoutRow.rows[0].score, 0);
+    EXPECT_EQ(withoutRow.rows[0].detailsSize, 0);
+    EXPECT_EQ(world.BoundCallResultCount(), 0u);
+    SteamAPI_Shutdown();
+    hostServices = nullptr;
+    world.Reset();
+    engine.Reset();
 }
 
 }  // namespace

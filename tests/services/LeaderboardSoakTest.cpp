@@ -215,6 +215,7 @@ TEST_F(LeaderboardSoak, ManyRequestsAndSubmissionsOnFaultyBoards)
     });
 
     std::vector<std::string> nodes;
+    nodes.reserve(kCategories);
     for (int b = 0; b < kCategories; ++b)
         nodes.push_back("id=\"" + CategoryName(b) + "\"");
     StartService(ConfigWith(nodes));

@@ -265,6 +265,7 @@ TEST_F(LeaderboardTest, DownloadsInFlightCompleteInAnyOrder)
 TEST_F(LeaderboardTest, EngineAsksWhileAThousandCategoriesAreConfigured)
 {
     std::vector<std::string> nodes;
+    nodes.reserve(1000);
     for (int i = 0; i < 1000; ++i)
         nodes.push_back("id=\"C" + std::to_string(i) + "\"");
     AddBoard("C999", 2);

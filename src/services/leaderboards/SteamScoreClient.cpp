@@ -3,6 +3,7 @@
 #include <cstring>
 #include <initializer_list>
 
+#include "data/HashedName.h"
 #include "foundation/TextFormat.h"
 #include "host/HostReport.h"
 #include "services/leaderboards/ClientList.h"
@@ -60,6 +61,7 @@ void CreateCategoryClients(const ScoreClientLists& lists, const char* id, ELeade
     for (SteamScoreClient* client : {global, third, friends}) {
         madeClients.Add(client);
         FormatToBuffer(client->name, sizeof client->name, "%s", id);
+        client->nameHash = HashText(client->name);
     }
     global->filter = FilterGlobal;
     lists.global->Add(global);

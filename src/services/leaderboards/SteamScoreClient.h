@@ -21,6 +21,7 @@ public:
     CCallResult<SteamScoreClient, LeaderboardFindResult_t> findResult;
     int32_t filter = 0;
     char name[32] = {};
+    uint32_t nameHash = 0;  // HashText(name): lookups compare it before the bytes
     // Written once on the engine's thread, read by the queue threads.
     std::atomic<SteamLeaderboard_t> leaderboard{0};
     // Every client made, newest first, so that an unload can release them all.
