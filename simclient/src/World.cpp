@@ -5,6 +5,7 @@
 
 #include "LeaderboardRank.h"
 #include "WorldState.h"
+#include "simclient/GeneratedPlayers.h"
 
 namespace simclient {
 
@@ -222,6 +223,11 @@ void World::ClearFaults()
     auto l = Lock();
     State().faults.clear();
 }
+void World::SetFaultSeed(uint64 seed)
+{
+    auto l = Lock();
+    State().faultRandom.seed(seed);
+}
 
 Journal World::GetJournal() const
 {
@@ -357,6 +363,18 @@ void World::SetPersonaNameNever(uint64 steamId)
     auto l = Lock();
     State().personas[steamId] = Persona{"[unknown]", Persona::Arrival::Never, {}, false};
 }
+void World::SetAllPersonaNamesArrive(Delay delay)
+{
+    auto l = Lock();
+    for (auto& [id, persona] : State().personas)
+        persona = Persona{persona.name, Persona::Arrival::OnRequest, delay, false};
+}
+void World::SetAllPersonaNamesNever()
+{
+    auto l = Lock();
+    for (auto& [id, persona] : State().personas)
+        persona = Persona{persona.name, Persona::Arrival::Never, {}, false};
+}
 void World::SetFriends(std::vector<uint64> steamIds)
 {
     auto l = Lock();
@@ -385,6 +403,22 @@ void World::AddLeaderboard(const std::string& name, ELeaderboardSortMethod sort,
     board.rows = std::move(rows);
     SortRows(board);
     State().leaderboards.push_back(std::move(board));
+}
+void World::AddGeneratedLeaderboard(const std::string& name, ELeaderboardSortMethod sort,
+                                    ELeaderboardDisplayType display, int count, uint64 seed,
+                                    std::vector<LeaderboardRow> rows)
+{
+    GeneratedPlayers players = GeneratePlayers(count, seed);  // outside the lock: 100,000 rows take a while
+    rows.insert(rows.end(), std::make_move_iterator(players.rows.begin()),
+                std::make_move_iterator(players.rows.end()));
+    {
+        auto l = Lock();
+        for (std::size_t i = 0; i < players.names.size(); ++i)
+            State().personas.emplace(
+                GeneratedPlayerId(static_cast<int>(i)),
+                Persona{std::move(players.names[i]), Persona::Arrival::Known, {}, false});
+    }
+    AddLeaderboard(name, sort, display, std::move(rows));
 }
 bool World::HasLeaderboard(const std::string& name) const
 {

@@ -72,6 +72,10 @@ AppliedFaults WorldState::TakeFaults(const std::string& call)
             ++it;
             continue;
         }
+        if (it->chance < 100 && static_cast<int>(faultRandom() % 100) >= it->chance) {
+            ++it;
+            continue;
+        }
         switch (it->kind) {
         case Fault::Kind::Fail:
             applied.fail = true;
@@ -93,6 +97,10 @@ AppliedFaults WorldState::TakeFaults(const std::string& call)
             break;
         case Fault::Kind::Drop:
             applied.drop = true;
+            break;
+        case Fault::Kind::RandomLatency:
+            applied.extraLatency +=
+                static_cast<int>(faultRandom() % (static_cast<uint64>(std::max(0, it->value)) + 1));
             break;
         }
         if (it->times == 1) {

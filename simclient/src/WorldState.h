@@ -13,6 +13,7 @@
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <random>
 #include <set>
 #include <string>
 #include <unordered_map>
@@ -135,6 +136,7 @@ struct WorldData {
 
     // Faults and journal
     std::map<std::string, std::vector<Fault>> faults;
+    std::mt19937_64 faultRandom{1};  // Fault::Chance and RandomLatency draw from it
     std::vector<JournalEntry> journal;
 
     // Statistics

@@ -9,6 +9,8 @@
 #include "run/Scenario.h"
 #include "run/ScenarioFile.h"
 #include "run/ScenarioParser.h"
+#include "simclient/GeneratedPlayers.h"
+#include "simclient/World.h"
 
 namespace steamext::run {
 namespace {
@@ -72,6 +74,16 @@ TEST(Records, PatternsMatchFieldsAndContains)
     json event = {{"kind", "event"}, {"type", 17}, {"PlayerId", nullptr}};
     EXPECT_TRUE(MatchesPattern(event, {{"PlayerId", nullptr}}));
     EXPECT_FALSE(MatchesPattern(event, {{"PlayerId", "0"}}));
+    // Rows of a scores event: each object names some fields of its row; the count must agree.
+    json scores = {{"kind", "event"},
+                   {"type", 19},
+                   {"entries", {{{"rank", 1}, {"userName", "Ann"}, {"details", {1, 2}}}, {{"rank", 2}}}}};
+    EXPECT_TRUE(MatchesPattern(scores, {{"entries", {{{"userName", "Ann"}}, json::object()}}}));
+    EXPECT_TRUE(MatchesPattern(scores, {{"entries", {{{"details", {1, 2}}}, {{"rank", 2}}}}}));
+    EXPECT_FALSE(MatchesPattern(scores, {{"entries", {{{"rank", 2}}, {{"rank", 1}}}}}));
+    EXPECT_FALSE(MatchesPattern(scores, {{"entries", {{{"rank", 1}}}}}));
+    EXPECT_FALSE(MatchesPattern(scores, {{"entries", {{{"details", {1}}}, json::object()}}}));
+    EXPECT_FALSE(MatchesPattern(scores, {{"entries", nullptr}}));
 }
 
 TEST(Base64, RoundTripsAndRefusesGarbage)
@@ -208,6 +220,33 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
         {"{\"world\": {\"user\": {\"steam_id\": -4}}, \"steps\": []}",
          "world.user.steam_id: expected a non-negative"},
         {"{\"world\": {\"server_time\": 1.5}, \"steps\": []}", "world.server_time: expected seconds"},
+        {R"({"world": {"leaderboards": [{"rows": []}]}, "steps": []})",
+         "world.leaderboards[0]: a leaderboard needs \"name\""},
+        {R"({"world": {"leaderboards": [{"name": "B", "sort": "ASCENDING"}]}, "steps": []})",
+         "world.leaderboards[0].sort: unknown word \"ASCENDING\"; expected one of: descending, ascending, "
+         "none"},
+        {R"({"world": {"leaderboards": [{"name": "B", "rows": [{"steam_id": 1, "score": 1, "details": [)"
+         "0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,0,"
+         "0,0,0,0,"
+         R"(0,0,0,0,0,0,0,0,0,0,0,0]}]}]}, "steps": []})",
+         "world.leaderboards[0].rows[0].details: at most 64 details"},
+        {R"({"world": {"leaderboards": [{"name": "B", "generated": {"seed": 2}}]}, "steps": []})",
+         "world.leaderboards[0].generated: generated rows need \"count\""},
+        {R"({"world": {"friends": [{"generated": -1}]}, "steps": []})",
+         "world.friends[0].generated: the integer -1"},
+        {R"({"world": {"personas": [{"steam_id": 5, "arrives": {"pumps": 2}}]}, "steps": []})",
+         "world.personas[0]: a player's name needs \"name\""},
+        {R"({"world": {"personas": [{"steam_id": 5, "name": "A", "arrives": {"pumps": 2, "ms": 3}}]}, "steps": []})",
+         "world.personas[0].arrives: expected {\"pumps\": n}"},
+        {R"({"world": {"all_names_arrive": "later"}, "steps": []})", "world.all_names_arrive: expected"},
+        {R"({"world": {"faults": [{"call": "FileRead", "kind": "fail", "chance": 0}]}, "steps": []})",
+         "world.faults[0].chance: the integer 0 is out of range 1..100"},
+        {R"({"steps": [{"wait_for": {"threads_ended": 3}}]})",
+         "steps[0].wait_for.threads_ended: expected a string"},
+        {R"({"steps": [{"call": "leaderboards.SubmitScore", "args": [0, {"scor": 1}, "B"]}]})",
+         "steps[0].args[1].scor: the score record has no field \"scor\""},
+        {R"({"steps": [{"fail_allocations": 0}]})",
+         "steps[0].fail_allocations: the integer 0 is out of range"},
         {"[1, 2]", "t.json:1:1: (top level): expected an object"},
         {"", "t.json:1:1: not valid JSON"},
     };
@@ -220,6 +259,33 @@ TEST(ScenarioParser, NamesThePlaceOfEachMistake)
             EXPECT_NE(std::string(error.what()).find(row.message), std::string::npos) << error.what();
         }
     }
+}
+
+// The world's leaderboard keys, applied to the simulated client, give the boards and the
+// names a scenario asked for.
+TEST(ScenarioParser, WorldBuildsBoardsFriendsAndNames)
+{
+    Scenario s = ParseScenario(
+        R"({"world": {"leaderboards": [{"name": "B", "sort": "ascending", "rows": [{"steam_id": 7, "score": 3,
+                "details": [4]}], "generated": {"count": 5, "seed": 9}}],
+            "friends": [7, {"generated": 2}],
+            "personas": [{"steam_id": 7, "name": {"base64": "QW7D"}}, {"steam_id": {"generated": 1}, "arrives": "never"}],
+            "fault_seed": 4}, "steps": []})",
+        "t.json", ".");
+    simclient::World& world = simclient::GetWorld();
+    world.Reset();
+    for (const WorldEdit& edit : s.world)
+        edit.apply(world);
+    const auto rows = world.LeaderboardRows("B");
+    ASSERT_EQ(rows.size(), 6u);
+    for (std::size_t i = 1; i < rows.size(); ++i)
+        EXPECT_LE(rows[i - 1].score, rows[i].score);  // ascending
+    ASSERT_TRUE(SteamAPI_Init());
+    EXPECT_STREQ(SteamFriends()->GetFriendPersonaName(CSteamID(uint64{7})), "An\xC3");
+    EXPECT_STREQ(SteamFriends()->GetFriendPersonaName(CSteamID(simclient::GeneratedPlayerId(2))),
+                 simclient::GeneratedPlayerName(2).c_str());
+    EXPECT_TRUE(SteamFriends()->RequestUserInformation(CSteamID(simclient::GeneratedPlayerId(1)), true));
+    world.Reset();
 }
 
 TEST(ScenarioParser, FillsDefaultsAndSizes)

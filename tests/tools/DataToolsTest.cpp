@@ -284,4 +284,89 @@ TEST_F(DataTools, ErrorsAreOneLine)
     }
 }
 
+TEST_F(DataTools, CheckWarnsAboutLeaderboardCategoriesTheModuleWouldNotReach)
+{
+    // Catches a wrong line, a warning missed or given for a word the module does accept,
+    // a node's text or close tag taken for a node of its own, a path matched by a loose
+    // ending, and --strict not failing.
+    fs::create_directories(Work() / "leaderboards");
+    fs::create_directories(Work() / "game" / "leaderboards");
+    const std::string thirtyOne(31, 'a');
+    const std::string thirtyTwo(32, 'b');
+    struct Warning {
+        int line;
+        std::string fragment;
+    };
+    struct Row {
+        const char* name;
+        std::string xml;
+        std::vector<Warning> warnings;
+    };
+    const Row rows[] = {
+        {"clean",
+         kDecl + "<root>\n<array id=\"CATEGORIES\">\n<node id=\"" + thirtyOne +
+             "\" sort=\"LOWEST_SCORE_FIRST\" display_type=\"MILLISECONDS\"/>\n"
+             "<node id=\"b\" sort=\"DESCENDING\" display_type=\"SECONDS\">text</node>\n"
+             "<node id=\"c\" sort=\"ASCENDING\" display_type=\"NUMERIC\"></node>\n</array>\n"
+             "<array id=\"OTHER\"><node sort=\"x\"/></array>\n</root>\n",
+         {}},
+        {"each fault once",
+         kDecl +
+             "<root>\n<array id=\"CATEGORIES\">\n"
+             "<node id=\"" +
+             thirtyTwo +
+             "\"/>\n"
+             "<node id=\"a\" sort=\"ascending\"/>\n"
+             "<node\n   id=\"a\" display_type=\"Seconds\"/>\n"
+             "<node sort=\"ASCENDING\"/>\n"
+             "</array>\n<array id=\"CATEGORIES\"><node id=\"z\"/></array>\n</root>\n",
+         {{4, "is 32 characters long"},
+          {5, "sort \"ascending\" is none of ASCENDING, LOWEST_SCORE_FIRST, DESCENDING"},
+          {6, "category id \"a\" repeats the one on line 5"},
+          {6, "display_type \"Seconds\" is none of NUMERIC, SECONDS, MILLISECONDS"},
+          {8, "a category without \"id\""},
+          {10, "a second array \"CATEGORIES\" (the first is on line 3)"}}},
+        {"no categories",
+         kDecl + "\n<root>\n<array id=\"categories\"><node id=\"a\"/></array>\n</root>\n",
+         {{3, "no array \"CATEGORIES\""}}},
+        {"empty categories",
+         kDecl + "<root>\n<array id=\"CATEGORIES\">\n</array>\n</root>\n",
+         {{3, "has no nodes"}}},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        for (const char* path : {"leaderboards/leaderboards.xml", "game/leaderboards/leaderboards.xml"}) {
+            Put(path, row.xml);
+            const Outcome outcome = Run({"data", "check", path});
+            EXPECT_EQ(outcome.status, 0) << outcome.out;
+            std::vector<std::string> lines = Lines(outcome.out);
+            ASSERT_EQ(lines.size(), row.warnings.size() + 1) << outcome.out;
+            for (std::size_t i = 0; i < row.warnings.size(); ++i) {
+                const std::string prefix =
+                    "warning: " + std::string(path) + ":" + std::to_string(row.warnings[i].line) + ": ";
+                EXPECT_EQ(lines[i].rfind(prefix, 0), 0u) << lines[i];
+                EXPECT_NE(lines[i].find(row.warnings[i].fragment), std::string::npos) << lines[i];
+            }
+            const Outcome strict = Run({"data", "check", "--strict", path});
+            EXPECT_EQ(strict.status, row.warnings.empty() ? 0 : 1);
+            EXPECT_EQ(Lines(strict.out).back().find("FAILED under --strict") != std::string::npos,
+                      !row.warnings.empty());
+        }
+    }
+    // The same file elsewhere, or under a name that only ends alike, is not a leaderboard file;
+    // scrambled, it is.
+    Put("leaderboards/leaderboards.xml", rows[2].xml);
+    Put("myleaderboards.xml", rows[2].xml);
+    fs::create_directories(Work() / "xleaderboards");
+    Put("xleaderboards/leaderboards.xml", rows[2].xml);
+    EXPECT_EQ(
+        Run({"data", "check", "--strict", "myleaderboards.xml", "xleaderboards/leaderboards.xml"}).status, 0);
+    ASSERT_EQ(Run({"data", "scramble", "leaderboards/leaderboards.xml", "game/leaderboards/leaderboards.xml"})
+                  .status,
+              0);
+    const Outcome scrambled = Run({"data", "check", "game/leaderboards/leaderboards.xml"});
+    EXPECT_EQ(scrambled.out.rfind("warning: game/leaderboards/leaderboards.xml:3: no array", 0), 0u)
+        << scrambled.out;
+}
+
 }  // namespace

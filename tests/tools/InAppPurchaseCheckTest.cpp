@@ -65,28 +65,29 @@ TEST_F(InAppPurchaseCheck, WarnsWithTheLineAboutWhatTheModuleIgnores)
         "</array>\n</root>\n");
     const std::string file = "in-app-purchases/in-app-purchases.xml";
     const std::string expected =
-        file +
-        ":5: warning: item \"sword\" is product 1002 but its id is not \"1002\": a purchase of it is never "
+        "warning: " + file +
+        ":5: item \"sword\" is product 1002 but its id is not \"1002\": a purchase of it is never "
         "reported\n" +
-        file +
-        ":6: warning: item \"01003\" is product 1003 but its id is not \"1003\": a purchase of it is never "
+        "warning: " + file +
+        ":6: item \"01003\" is product 1003 but its id is not \"1003\": a purchase of it is never "
         "reported\n" +
-        file +
-        ":7: warning: item \"1004\": \"steam_id\" \"1004abc\" has characters after its digits: the platform "
+        "warning: " + file +
+        ":7: item \"1004\": \"steam_id\" \"1004abc\" has characters after its digits: the platform "
         "is asked about 1004, the store address gets the whole text\n" +
-        file + ":8: warning: item \"free\": \"steam_id\" \"0\" reads as 0: the item is not sold\n" + file +
-        ":9: warning: item \"nothing\" has no \"steam_id\": the item is not sold\n" + file +
-        ":10: warning: item \"1001\" repeats an id (first at line 4): only the first is read\n" + file +
-        ":11: warning: item \"1005\": \"steam_id\" \"+1005\" is not plain decimal digits: the platform is "
+        "warning: " + file + ":8: item \"free\": \"steam_id\" \"0\" reads as 0: the item is not sold\n" +
+        "warning: " + file + ":9: item \"nothing\" has no \"steam_id\": the item is not sold\n" +
+        "warning: " + file + ":10: item \"1001\" repeats an id (first at line 4): only the first is read\n" +
+        "warning: " + file +
+        ":11: item \"1005\": \"steam_id\" \"+1005\" is not plain decimal digits: the platform is "
         "asked about 1005, the store address gets the whole text\n" +
-        file + ": ok (1 arrays, 8 nodes)\n";
+        file + ": ok (1 arrays, 8 nodes), 7 warnings\n";
     Outcome plain = Check("");
     EXPECT_EQ(plain.status, 0);
     EXPECT_EQ(plain.out, expected);
 
     Outcome strict = Check("--strict");
     EXPECT_EQ(strict.status, 1);
-    EXPECT_NE(strict.out.find(file + ": FAILED: 7 warning(s) under --strict\n"), std::string::npos)
+    EXPECT_NE(strict.out.find(file + ": FAILED under --strict (7 warnings)\n"), std::string::npos)
         << strict.out;
 }
 

@@ -180,6 +180,9 @@ public:
     // listing the known names.
     void InjectFault(const std::string& call, Fault fault);
     void ClearFaults();
+    // Seed of the choices that faults with a chance or a random latency make (default 1;
+    // Reset puts it back): the same seed and the same calls give the same faults.
+    void SetFaultSeed(uint64 seed);
 
     // --- Journal and warnings ----------------------------------------------------------------
     // The whole journal (a copy).
@@ -232,6 +235,11 @@ public:
     void SetPersonaName(uint64 steamId, const std::string& name, bool known = true);
     void SetPersonaNameArrives(uint64 steamId, const std::string& name, Delay delay);
     void SetPersonaNameNever(uint64 steamId);
+    // The same for every other player the world holds a name for at this moment (players
+    // of generated boards included): each keeps its name, which arrives `delay` after its
+    // first request, or never. Players set afterwards are not affected.
+    void SetAllPersonaNamesArrive(Delay delay);
+    void SetAllPersonaNamesNever();
     void SetFriends(std::vector<uint64> steamIds);
     std::vector<std::pair<AppId_t, EOverlayToStoreFlag>> StoreOverlayRequests() const;
     std::vector<std::pair<std::string, EActivateGameOverlayToWebPageMode>> WebPageRequests() const;
@@ -239,6 +247,12 @@ public:
     // --- Leaderboards --------------------------------------------------------------------------
     void AddLeaderboard(const std::string& name, ELeaderboardSortMethod sort, ELeaderboardDisplayType display,
                         std::vector<LeaderboardRow> rows = {});
+    // A board of `rows` and `count` generated players (GeneratedPlayers.h, with `seed`).
+    // A generated player's name is known from now on, unless the world already has a
+    // setting for that player (set late or missing names before or after, as wanted).
+    void AddGeneratedLeaderboard(const std::string& name, ELeaderboardSortMethod sort,
+                                 ELeaderboardDisplayType display, int count, uint64 seed,
+                                 std::vector<LeaderboardRow> rows = {});
     bool HasLeaderboard(const std::string& name) const;
     // Rows in rank order: best first, equal scores in the order they were set (rows given
     // to AddLeaderboard keep their order among equals; an upload goes after its equals).

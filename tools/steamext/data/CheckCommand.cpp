@@ -1,12 +1,12 @@
 // "steamext data check FILE...": each file loaded as the module would, popups
-// answered "give up"; the module's messages as they reach the engine, warnings
-// about what the module would ignore in a file it knows, then one verdict line
-// per file. Exit 1 if a file failed to load (or, with --strict, got a warning),
-// 2 if one was unreadable.
+// answered "give up"; the module's messages as they reach the engine, then one
+// verdict line per file. Beside them the tool's own warnings (DataWarnings.h) about what
+// the module would quietly ignore. Exit 1 if a file failed to load (or, with --strict,
+// had warnings), 2 if one was unreadable.
 #include <iostream>
 
 #include "data/DataTool.h"
-#include "data/InAppPurchaseWarnings.h"
+#include "data/DataWarnings.h"
 
 namespace datatool {
 
@@ -53,19 +53,22 @@ int RunCheck(const CheckOptions& options)
                     std::cout << "ShowPopup: " << command->argument.value_or("") << "\n";
             }
         }
-        int warnings = WarnAboutInAppPurchases(file, bytes, outcome, std::cout);
         int arrays = 0;
         int nodes = 0;
         for (const DataArray* array : outcome.database->arrays) {
             ++arrays;
             nodes += array->nodes.count;
         }
-        if (outcome.loaded && options.strict && warnings > 0) {
-            std::cout << file << ": FAILED: " << warnings << " warning(s) under --strict\n";
+        const int warnings = outcome.loaded ? PrintDataWarnings(file, bytes, outcome, std::cout) : 0;
+        if (outcome.loaded && warnings > 0 && options.strict) {
+            std::cout << file << ": FAILED under --strict (" << warnings << " warnings)\n";
             if (status == 0)
                 status = 1;
         } else if (outcome.loaded) {
-            std::cout << file << ": ok (" << arrays << " arrays, " << nodes << " nodes)\n";
+            std::cout << file << ": ok (" << arrays << " arrays, " << nodes << " nodes)";
+            if (warnings > 0)
+                std::cout << ", " << warnings << " warnings";
+            std::cout << "\n";
         } else {
             std::cout << file << ": FAILED to load\n";
             if (status == 0)
@@ -83,7 +86,7 @@ void AddCheckCommand(CLI::App& data, SubcommandAction& action)
     CLI::App* check =
         data.add_subcommand("check", "Load each file as the module would and report what it says");
     check->add_option("files", options->files, "Data files (.xml, .dat, .csv)")->required();
-    check->add_flag("--strict", options->strict, "Fail a file that gets warnings, as one that does not load");
+    check->add_flag("--strict", options->strict, "Fail a file that has warnings");
     check->callback([options, &action] { action = [options] { return RunCheck(*options); }; });
 }
 

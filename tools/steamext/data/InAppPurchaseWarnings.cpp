@@ -1,4 +1,6 @@
-#include "data/InAppPurchaseWarnings.h"
+// Warnings for the store's configuration, "in-app-purchases/in-app-purchases.xml": what
+// the module reads without a word but can never sell or never report.
+#include "data/DataWarnings.h"
 
 #include <cctype>
 #include <cstring>
@@ -12,13 +14,6 @@
 namespace datatool {
 
 namespace {
-
-const char kFileName[] = "in-app-purchases.xml";
-
-bool EndsWith(const std::string& text, const std::string& end)
-{
-    return text.size() >= end.size() && text.compare(text.size() - end.size(), end.size(), end) == 0;
-}
 
 bool IsId(const char* name)
 {
@@ -89,22 +84,9 @@ bool IsPlainDigits(const char* text)
 
 class Reporter {
 public:
-    Reporter(const std::string& path, std::ostream& out) : path_(path), out_(out) {}
+    void Warn(int line, const std::string& text) { warnings.push_back({line, text}); }
 
-    void Warn(int line, const std::string& text)
-    {
-        out_ << path_;
-        if (line > 0)
-            out_ << ":" << line;
-        out_ << ": warning: " << text << "\n";
-        ++count_;
-    }
-    int Count() const { return count_; }
-
-private:
-    const std::string& path_;
-    std::ostream& out_;
-    int count_ = 0;
+    std::vector<DataWarning> warnings;
 };
 
 void CheckValue(Reporter& report, int line, const std::string& item, const char* text)
@@ -126,17 +108,16 @@ void CheckValue(Reporter& report, int line, const std::string& item, const char*
 
 }  // namespace
 
-int WarnAboutInAppPurchases(const std::string& path, const std::string& bytes, const LoadOutcome& outcome,
-                            std::ostream& out)
+std::vector<DataWarning> WarnInAppPurchases(const std::string& path, const std::string& bytes,
+                                            const LoadOutcome& outcome)
 {
-    const bool known = path == kFileName || EndsWith(path, std::string("/") + kFileName);
-    if (!known || !outcome.loaded)
-        return 0;
-    Reporter report(path, out);
+    if (!outcome.loaded)
+        return {};
+    Reporter report;
     const DataArray* items = outcome.database->FindArray("ITEMS");
     if (items == nullptr) {
         report.Warn(0, "no array \"ITEMS\": nothing is sold");
-        return report.Count();
+        return report.warnings;
     }
     std::vector<int> lines = ItemLines(path, bytes);
     if (lines.size() != static_cast<size_t>(items->nodes.count))
@@ -168,7 +149,7 @@ int WarnAboutInAppPurchases(const std::string& path, const std::string& bytes, c
             report.Warn(line, item + " is product " + std::to_string(number) + " but its id is not \"" +
                                   std::to_string(number) + "\": a purchase of it is never reported");
     }
-    return report.Count();
+    return report.warnings;
 }
 
 }  // namespace datatool

@@ -5,6 +5,7 @@
 #include "run/EngineSession.h"
 
 #include <chrono>
+#include <cstring>
 #include <map>
 #include <mutex>
 #include <set>
@@ -70,6 +71,16 @@ json Text(const std::optional<std::string>& text)
     return text ? json(*text) : json(nullptr);
 }
 
+// A row's 47 detail values, without the zeros at the end: what was given shows as given.
+json Details(const simengine::ScoreRow& row)
+{
+    std::vector<int32_t> values(row.details.size() / 4);
+    std::memcpy(values.data(), row.details.data(), values.size() * 4);
+    while (!values.empty() && values.back() == 0)
+        values.pop_back();
+    return values;
+}
+
 json ToRecord(const simengine::PostedEvent& event)
 {
     json record = {{"kind", "event"}, {"type", event.type}, {"status", event.status}};
@@ -85,12 +96,14 @@ json ToRecord(const simengine::PostedEvent& event)
         record["start"] = s.start;
         record["count"] = s.count;
         json rows = json::array();
-        for (const auto& row : s.rows)
-            rows.push_back({{"userId", row.userId},
-                            {"userName", row.userName},
-                            {"score", row.score},
-                            {"rank", row.rank},
-                            {"detailsSize", row.detailsSize}});
+        for (const auto& row : s.rows) {
+            json shown = {
+                {"userId", row.userId}, {"userName", row.userName},       {"score", row.score},
+                {"rank", row.rank},     {"detailsSize", row.detailsSize}, {"details", Details(row)}};
+            if (row.reserved != 0)
+                shown["reserved"] = row.reserved;
+            rows.push_back(std::move(shown));
+        }
         record["entries"] = event.scores->entriesNull ? json(nullptr) : rows;
     }
     if (event.store) {
@@ -231,6 +244,17 @@ void EngineSession::Advance(uint32_t ms)
         std::this_thread::sleep_for(std::chrono::duration<double, std::milli>(ms / state_->timeScale));
 }
 
+void EngineSession::SettleThreads()
+{
+    if (state_->manualClock)
+        Settle();
+}
+
+void EngineSession::FailAllocations(int count)
+{
+    state_->engine.Memory().FailNextAllocations(count);
+}
+
 void EngineSession::Settle()
 {
     // With the manual clock, time must not move while a thread of the module
@@ -258,6 +282,13 @@ std::vector<json> EngineSession::TakeRecords()
     }
     state_->mark = next;
     return records;
+}
+
+int EngineSession::RunningThreads(const std::string& name) const
+{
+    if (StartedNames().count(name) == 0)
+        return -1;
+    return state_->engine.Threads().RunningCount(name);
 }
 
 std::string EngineSession::ThreadName(std::thread::id id) const

@@ -55,6 +55,12 @@ public:
     // tells whether it was needed.
     void Advance(uint32_t ms);
     const simengine::Engine::SettleReport& LastSettle() const { return lastSettle_; }
+    // With the manual clock, waits until the module's threads are settled without moving
+    // the clock: what a call or a world change sets off lands in its own step (a thread the
+    // call started, an entry a queue's thread takes). Nothing with the scaled clock.
+    void SettleThreads();
+    // The engine's next `count` Allocate calls, on any thread, give null.
+    void FailAllocations(int count);
     // A platform call made on the calling thread, for telling polls from work;
     // the simulated client's call observer feeds it.
     static void NotePlatformCall(const char* name, const std::string& args);
@@ -63,6 +69,9 @@ public:
     std::vector<nlohmann::json> TakeRecords();
     // The name a thread of the module was started with, or "" if unknown.
     std::string ThreadName(std::thread::id id) const;
+    // Threads of this name that the module started and that have not ended yet; -1 when
+    // the module never started one of this name.
+    int RunningThreads(const std::string& name) const;
 
     // Sets IsQuitting and waits, with a bound, for every thread the module
     // started; returns the names of those that did not end.

@@ -147,6 +147,7 @@ const OperationTable& Operations()
         RegisterAchievementOperations(built);
         RegisterCloudOperations(built);
         RegisterStoreOperations(built);
+        RegisterLeaderboardOperations(built);
         return built;
     }();
     return table;

@@ -144,5 +144,6 @@ void RegisterModuleOperations(OperationTable& table);
 void RegisterAchievementOperations(OperationTable& table);
 void RegisterCloudOperations(OperationTable& table);
 void RegisterStoreOperations(OperationTable& table);
+void RegisterLeaderboardOperations(OperationTable& table);
 
 }  // namespace steamext::run

@@ -4,6 +4,24 @@ namespace steamext::run {
 
 using nlohmann::json;
 
+namespace {
+
+// A value matches when equal; an object in an array (a row of an event) is a pattern of
+// its own, so that rows can be checked by some of their fields.
+bool Matches(const json& value, const json& pattern)
+{
+    if (!pattern.is_array() || !value.is_array() || pattern.size() != value.size())
+        return value == pattern;
+    for (std::size_t i = 0; i < pattern.size(); ++i) {
+        const bool rowPattern = pattern[i].is_object() && value[i].is_object();
+        if (rowPattern ? !MatchesPattern(value[i], pattern[i]) : value[i] != pattern[i])
+            return false;
+    }
+    return true;
+}
+
+}  // namespace
+
 bool MatchesPattern(const json& record, const json& pattern)
 {
     static const std::string kContains = "_contains";
@@ -22,7 +40,7 @@ bool MatchesPattern(const json& record, const json& pattern)
             continue;
         }
         auto found = record.find(key);
-        if (found == record.end() || *found != item.value())
+        if (found == record.end() || !Matches(*found, item.value()))
             return false;
     }
     return true;
@@ -54,9 +72,23 @@ std::string DescribeRecord(const json& record)
     const std::string kind = record.value("kind", "");
     if (kind == "event") {
         std::string line = "event " + std::to_string(record.value("type", 0));
+        const json* rows = nullptr;
         for (const auto& item : record.items()) {
-            if (item.key() != "kind" && item.key() != "type")
+            if (item.key() == "entries" && item.value().is_array())
+                rows = &item.value();
+            else if (item.key() != "kind" && item.key() != "type")
                 line += "  " + item.key() + "=" + Compact(item.value());
+        }
+        if (rows != nullptr) {  // a leaderboard's rows, one line each
+            line += "  entries:";
+            static const char* const kOrder[] = {"rank",        "score",   "userId",  "userName",
+                                                 "detailsSize", "details", "reserved"};
+            for (const json& row : *rows) {
+                line += "\n   ";
+                for (const char* key : kOrder)
+                    if (row.contains(key))
+                        line += std::string(" ") + key + "=" + Compact(row[key]);
+            }
         }
         return line;
     }

@@ -99,6 +99,7 @@ private:
             break;
         case StepKind::Call:
             result = Call(step);
+            engine_->SettleThreads();
             break;
         case StepKind::Frames:
             timeline_.Step(Now(), step.index, "pump " + std::to_string(step.frames) + " frame(s)", step.note,
@@ -118,6 +119,13 @@ private:
         case StepKind::Read:
             result = Read(step);
             break;
+        case StepKind::FailAllocations:
+            timeline_.Step(Now(), step.index,
+                           "the engine's next " + std::to_string(step.failAllocations) +
+                               " Allocate call(s) give null",
+                           step.note, {{"action", "fail_allocations"}, {"count", step.failAllocations}});
+            engine_->FailAllocations(step.failAllocations);
+            break;
         case StepKind::World: {
             std::string what;
             for (const auto& edit : step.world)
@@ -126,6 +134,7 @@ private:
                            {{"action", "world"}, {"changes", what}});
             for (const auto& edit : step.world)
                 edit.apply(world_);
+            engine_->SettleThreads();
             break;
         }
         }
@@ -213,6 +222,14 @@ private:
         std::size_t looked = 0;
         for (;;) {
             Gather();
+            if (step.wait.kind == "threads_ended" &&
+                engine_->RunningThreads(step.wait.pattern["name"]) == 0) {
+                const Moment now = Now();
+                timeline_.Outcome(now, "ended after " + std::to_string(now.frame - start.frame) +
+                                           " frame(s), " + std::to_string(now.clockMs - start.clockMs) +
+                                           " ms");
+                return;
+            }
             for (; looked < stepRecords_.size(); ++looked) {
                 const json& record = stepRecords_[looked];
                 if (record.value("kind", "") == step.wait.kind && MatchesPattern(record, step.wait.pattern)) {

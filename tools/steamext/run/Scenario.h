@@ -49,7 +49,7 @@ struct EngineSetup {
 
 // What a step waits for: a record of one kind matching a pattern.
 struct WaitCondition {
-    std::string kind;  // "event", "log", "platform_call"
+    std::string kind;  // "event", "log", "platform_call", "threads_ended" (pattern {"name": ...})
     nlohmann::json pattern;
     std::string description;
 };
@@ -75,6 +75,7 @@ enum class StepKind {
     Wait,
     World,
     Read,
+    FailAllocations,
 };
 
 struct Step {
@@ -91,9 +92,10 @@ struct Step {
     std::string readName;                      // Read: a record kept by an earlier call
     const RecordLayout* readLayout = nullptr;  // and its layout
 
-    uint32_t frames = 0;     // Frames
-    uint32_t advanceMs = 0;  // Advance
-    WaitCondition wait;      // Wait
+    uint32_t frames = 0;      // Frames
+    uint32_t advanceMs = 0;   // Advance
+    int failAllocations = 0;  // FailAllocations
+    WaitCondition wait;       // Wait
     uint32_t timeoutMs = 0;
     std::vector<WorldEdit> world;  // World
 

@@ -287,9 +287,9 @@ void ParseExpectations(const R& r, const json& step, const std::string& at, cons
 WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
 {
     r.Object(value, at);
-    r.OnlyKeys(value, at, {"event", "log", "platform_call"});
+    r.OnlyKeys(value, at, {"event", "log", "platform_call", "threads_ended"});
     if (value.size() != 1)
-        r.Fail(at, "wait for exactly one thing: \"event\", \"log\" or \"platform_call\"");
+        r.Fail(at, "wait for exactly one thing: \"event\", \"log\", \"platform_call\" or \"threads_ended\"");
     WaitCondition wait;
     wait.kind = value.begin().key();
     const std::string p = R::Child(at, wait.kind);
@@ -297,6 +297,10 @@ WaitCondition ParseWait(const R& r, const json& value, const std::string& at)
     if (wait.kind == "event") {
         wait.pattern = what.is_number_integer() ? json{{"type", r.Int(what, p)}} : r.Object(what, p);
         wait.description = "event " + wait.pattern.dump();
+    } else if (wait.kind == "threads_ended") {
+        // Every thread of this name that the module started has ended (and it started one).
+        wait.pattern = json{{"name", r.String(what, p)}};
+        wait.description = "the end of the threads \"" + wait.pattern["name"].get<std::string>() + "\"";
     } else if (wait.kind == "log") {
         wait.pattern = ParsePattern(r, what, p, "text", kLogKeys, false);
         wait.description = "log line " + wait.pattern.dump();
@@ -316,8 +320,8 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
     const json& step = r.Object(value, at);
     r.OnlyKeys(step, at,
                {"note", "call", "args", "frames", "advance_ms", "wait_for", "timeout_ms", "world", "keep_as",
-                "read", "expect", "events", "logs", "no_logs", "platform_calls", "no_platform_calls",
-                "host_commands", "inputs"});
+                "read", "fail_allocations", "expect", "events", "logs", "no_logs", "platform_calls",
+                "no_platform_calls", "host_commands", "inputs"});
     Step s;
     s.index = index;
     s.place = r.Place(at);
@@ -325,11 +329,11 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
         s.note = r.String(step["note"], R::Child(at, "note"));
 
     int actions = 0;
-    for (const char* key : {"call", "frames", "advance_ms", "wait_for", "world", "read"})
+    for (const char* key : {"call", "frames", "advance_ms", "wait_for", "world", "read", "fail_allocations"})
         actions += step.contains(key) ? 1 : 0;
     if (actions > 1)
         r.Fail(at, "a step does one thing: one of \"call\", \"frames\", \"advance_ms\", \"wait_for\", "
-                   "\"world\", \"read\"");
+                   "\"world\", \"read\", \"fail_allocations\"");
     if (step.contains("keep_as") && !step.contains("call"))
         r.Fail(R::Child(at, "keep_as"), "\"keep_as\" belongs to a \"call\"");
     if (step.contains("args") && !step.contains("call"))
@@ -379,6 +383,9 @@ Step ParseStep(const R& r, const json& value, const std::string& at, std::size_t
     } else if (step.contains("world")) {
         s.kind = StepKind::World;
         s.world = ParseWorld(r, step["world"], R::Child(at, "world"));
+    } else if (step.contains("fail_allocations")) {
+        s.kind = StepKind::FailAllocations;
+        s.failAllocations = r.Int(step["fail_allocations"], R::Child(at, "fail_allocations"), 1, 1000000);
     } else if (step.contains("read")) {
         s.kind = StepKind::Read;
         const std::string p = R::Child(at, "read");

@@ -1,5 +1,6 @@
 #include "run/Timeline.h"
 
+#include <algorithm>
 #include <cstdio>
 
 #include "run/Records.h"
@@ -83,7 +84,11 @@ public:
             int level = record.value("level", 0);
             colour = level == 1 ? kYellow : level >= 2 ? kRed : "";
         }
-        out_ << Blank() << "  " << Paint(colour, DescribeRecord(record)) << "\n";
+        const std::string text = DescribeRecord(record);
+        for (std::size_t from = 0, to = 0; from <= text.size(); from = to + 1) {
+            to = std::min(text.find('\n', from), text.size());
+            out_ << Blank() << "  " << Paint(colour, text.substr(from, to - from)) << "\n";
+        }
     }
 
     void Check(std::size_t, bool passed, const std::string& text) override

@@ -3,6 +3,7 @@
 #include <simclient/World.h>
 
 #include "run/StoreWorldSetup.h"
+#include "run/WorldLeaderboards.h"
 
 namespace steamext::run {
 
@@ -41,6 +42,7 @@ const FaultKind kFaultKinds[] = {
     {"extra_latency", simclient::Fault::Kind::ExtraLatency, true},
     {"short_read", simclient::Fault::Kind::ShortRead, true},
     {"drop", simclient::Fault::Kind::Drop, false},
+    {"random_latency", simclient::Fault::Kind::RandomLatency, true},
 };
 
 std::string Shown(const json& value)
@@ -118,7 +120,7 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
     for (std::size_t i = 0; i < value.size(); ++i) {
         const std::string at = ScenarioFile::Child(pointer, i);
         const json& entry = r.Object(value[i], at);
-        r.OnlyKeys(entry, at, {"call", "kind", "value", "skip", "times"});
+        r.OnlyKeys(entry, at, {"call", "kind", "value", "skip", "times", "chance"});
         if (!entry.contains("call") || !entry.contains("kind"))
             r.Fail(at, "a fault needs \"call\" (the platform call's name) and \"kind\"");
         std::string call = r.String(entry["call"], ScenarioFile::Child(at, "call"));
@@ -152,6 +154,8 @@ WorldEdit ParseFaults(const ScenarioFile& r, const json& value, const std::strin
             fault.skip = r.Int(entry["skip"], ScenarioFile::Child(at, "skip"), 0);
         if (entry.contains("times"))
             fault.times = r.Int(entry["times"], ScenarioFile::Child(at, "times"), 0);
+        if (entry.contains("chance"))
+            fault.chance = r.Int(entry["chance"], ScenarioFile::Child(at, "chance"), 1, 100);
         faults.emplace_back(call, fault);
     }
     return {"faults " + Shown(value), [faults](World& w) {
@@ -200,6 +204,11 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
                                                    "dlcs",
                                                    "dlc_installed",
                                                    "store_visit",
+                                                   "leaderboards",
+                                                   "friends",
+                                                   "personas",
+                                                   "all_names_arrive",
+                                                   "fault_seed",
                                                    "clear_faults",
                                                    "faults",
                                                    "overlay_active",
@@ -272,6 +281,17 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
             edits.push_back(ParseCloudFiles(r, value, at));
         } else if (IsStoreWorldKey(key)) {
             edits.push_back(ParseStoreWorldKey(r, key, value, at));
+        } else if (key == "leaderboards") {
+            edits.push_back(ParseLeaderboards(r, value, at));
+        } else if (key == "friends") {
+            edits.push_back(ParseFriends(r, value, at));
+        } else if (key == "personas") {
+            edits.push_back(ParsePersonas(r, value, at));
+        } else if (key == "all_names_arrive") {
+            edits.push_back(ParseAllNames(r, value, at));
+        } else if (key == "fault_seed") {
+            uint64 seed = r.UInt64(value, at);
+            edits.push_back({shown, [seed](World& w) { w.SetFaultSeed(seed); }});
         } else if (key == "faults") {
             edits.push_back(ParseFaults(r, value, at));
         } else if (key == "clear_faults") {
