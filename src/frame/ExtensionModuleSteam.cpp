@@ -8,6 +8,7 @@
 #include "services/achievements/AchievementImplementationSteam.h"
 #include "services/achievements/SteamAchievements.h"
 #include "services/cloud/CloudImplementationSteam.h"
+#include "services/workshop/UGCImplementationSteam.h"
 
 const char* ExtensionModuleSteam::GetName()
 {
@@ -59,7 +60,9 @@ BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumbe
         return cloud;
     case kServiceAchievements:
         return achievements;
-    // Store (4), leaderboards (2) and workshop (6) are not built yet: their
+    case kServiceWorkshop:
+        return ugc;
+    // Store (4) and leaderboards (2) are not built yet: their
     // fields stay null, as before a successful Initialize.
     default:
         return nullptr;
@@ -72,4 +75,5 @@ void ExtensionModuleSteam::CreateServices()
     // each pointer stored as soon as its object exists.
     cloud = new CloudImplementationSteam();
     achievements = new AchievementImplementationSteam();
+    ugc = new UGCImplementationSteam();
 }
