@@ -126,7 +126,8 @@ void CWorkshopSubscriptions::OnQueryCompleted(SteamUGCQueryCompleted_t* result, 
         char folder[kFolderRoom] = {};
         uint64 sizeOnDisk = 0;
         uint32 timeStamp = 0;
-        if (!ugc->GetItemInstallInfo(details.m_nPublishedFileId, &sizeOnDisk, folder, kFolderRoom, &timeStamp)) {
+        if (!ugc->GetItemInstallInfo(details.m_nPublishedFileId, &sizeOnDisk, folder, kFolderRoom,
+                                     &timeStamp)) {
             HostLogInfo("Getting install path failed. Is Steam Cloud enabled for the user?");
             continue;
         }

@@ -47,7 +47,7 @@ public:
     PublishedFileId_t* fileIds = nullptr;
     uint32_t fileIdCount = 0;
     UGCQueryHandle_t queryHandle = 0;
-    uint32_t appId = 0;  // kept for symmetry with the publishing side; nothing reads it
+    uint32_t appId = 0;                 // kept for symmetry with the publishing side; nothing reads it
     std::atomic<uint8_t> listReady{0};  // read by other engine threads without the mutex
     CCallResult<CWorkshopSubscriptions, SteamUGCQueryCompleted_t> queryCallResult;
 

@@ -158,7 +158,8 @@ void UGCImplementationSteam::UnsubscribeItem(const char* id)
 
 UGCItem* UGCImplementationSteam::PublishItem(const UGCItem* item)
 {
-    if (item == nullptr || item->title == nullptr || item->description == nullptr || item->contentPath == nullptr)
+    if (item == nullptr || item->title == nullptr || item->description == nullptr ||
+        item->contentPath == nullptr)
         return nullptr;
     // One publication at a time: a second one would take over the handlers of the first.
     if (workshopItemCreate->IsPublishing())

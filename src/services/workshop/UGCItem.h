@@ -12,9 +12,9 @@ struct UGCItem {
     char* id;  // decimal published file id; null until the platform has created the item
     char* title;
     char* description;
-    char* tags;         // separated by ","; may be null
-    char* installPath;  // engine path of the item's folder here; null when not known
-    char* contentPath;  // engine path of the folder to upload; null in subscribed items
+    char* tags;          // separated by ","; may be null
+    char* installPath;   // engine path of the item's folder here; null when not known
+    char* contentPath;   // engine path of the folder to upload; null in subscribed items
     int32_t visibility;  // 0 public, 1 friends only, anything else private
     uint8_t subscribeAfterPublish;
     uint8_t padding[3];

@@ -146,6 +146,7 @@ const OperationTable& Operations()
         RegisterModuleOperations(built);
         RegisterAchievementOperations(built);
         RegisterCloudOperations(built);
+        RegisterWorkshopOperations(built);
         return built;
     }();
     return table;

@@ -143,5 +143,6 @@ CallResult RecordResult(const void* record);
 void RegisterModuleOperations(OperationTable& table);
 void RegisterAchievementOperations(OperationTable& table);
 void RegisterCloudOperations(OperationTable& table);
+void RegisterWorkshopOperations(OperationTable& table);
 
 }  // namespace steamext::run

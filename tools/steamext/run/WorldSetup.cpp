@@ -1,5 +1,7 @@
 #include "run/WorldSetup.h"
 
+#include "run/WorkshopWorldSetup.h"
+
 #include <simclient/World.h>
 
 namespace steamext::run {
@@ -175,30 +177,26 @@ WorldEdit ParseCloudFiles(const ScenarioFile& r, const json& value, const std::s
             }};
 }
 
+// The state keys, the workshop's after them, then the faults and actions.
+std::vector<std::string> WithWorkshopKeys(std::vector<std::string> state,
+                                          const std::vector<std::string>& actions)
+{
+    const auto& workshop = WorkshopWorldKeys();
+    state.insert(state.end(), workshop.begin(), workshop.end());
+    state.insert(state.end(), actions.begin(), actions.end());
+    return state;
+}
+
 }  // namespace
 
 std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, const std::string& pointer)
 {
     r.Object(world, pointer);
-    static const std::vector<std::string> kKeys = {"steam_running",
-                                                   "init_succeeds",
-                                                   "interfaces",
-                                                   "user",
-                                                   "app_id",
-                                                   "overlay_enabled",
-                                                   "server_time",
-                                                   "language",
-                                                   "branch",
-                                                   "latency",
-                                                   "stats",
-                                                   "achievements",
-                                                   "stats_received_result",
-                                                   "stats_stored_result",
-                                                   "cloud_files",
-                                                   "clear_faults",
-                                                   "faults",
-                                                   "overlay_active",
-                                                   "warning"};
+    static const std::vector<std::string> kKeys =
+        WithWorkshopKeys({"steam_running", "init_succeeds", "interfaces", "user", "app_id", "overlay_enabled",
+                          "server_time", "language", "branch", "latency", "stats", "achievements",
+                          "stats_received_result", "stats_stored_result", "cloud_files"},
+                         {"clear_faults", "faults", "overlay_active", "warning"});
     r.OnlyKeys(world, pointer, kKeys);
     std::vector<WorldEdit> edits;
     // Keys apply in the order of kKeys, whatever their order in the file: the
@@ -265,6 +263,8 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
             edits.push_back(ParseStatsResult(r, value, at, key == "stats_received_result"));
         } else if (key == "cloud_files") {
             edits.push_back(ParseCloudFiles(r, value, at));
+        } else if (IsWorkshopWorldKey(key)) {
+            edits.push_back(ParseWorkshopWorld(r, key, value, at));
         } else if (key == "faults") {
             edits.push_back(ParseFaults(r, value, at));
         } else if (key == "clear_faults") {
