@@ -56,7 +56,6 @@ void UploadStep(WorldData& d, const UploadRun& run)
         break;
     case k_EItemUpdateStatusPreparingContent:
         u.status = k_EItemUpdateStatusUploadingContent;
-        u.total = run.plan.contentBytes;
         break;
     case k_EItemUpdateStatusUploadingContent:
         u.processed = std::min(u.total, u.processed + run.plan.bytesPerStep);
@@ -263,7 +262,8 @@ public:
         ItemUpdate& update = found->second;
         update.uploading = true;
         update.status = k_EItemUpdateStatusPreparingConfig;
-        update.processed = update.total = 0;
+        update.processed = 0;
+        update.total = s.upload->contentBytes;  // known from the start, as the content is measured
         ScheduleUploadStep(
             s, UploadRun{handle, callHandle, *s.upload, result, call.faults.ioFailure, call.faults.drop});
         return callHandle;

@@ -84,8 +84,9 @@ struct WorkshopDownload {
 
 // How a SubmitItemUpdate goes on: every `step` the update moves on, through
 // PreparingConfig, PreparingContent, UploadingContent (`bytesPerStep` more each step
-// until `contentBytes`), UploadingPreviewFile and CommittingChanges; then its result
-// arrives (`result`, unless a fault says otherwise) and the handle reports Invalid.
+// until `contentBytes`), UploadingPreviewFile and CommittingChanges, reporting
+// `contentBytes` as the total throughout; then its result arrives (`result`, unless a
+// fault says otherwise) and the handle reports Invalid.
 struct WorkshopUpload {
     uint64 contentBytes = 0;
     uint64 bytesPerStep = 0;

@@ -17,9 +17,9 @@ struct StateBit {
 };
 
 const StateBit kStateBits[] = {
-    {"subscribed", k_EItemStateSubscribed},      {"legacy", k_EItemStateLegacyItem},
-    {"installed", k_EItemStateInstalled},        {"needs_update", k_EItemStateNeedsUpdate},
-    {"downloading", k_EItemStateDownloading},    {"download_pending", k_EItemStateDownloadPending},
+    {"subscribed", k_EItemStateSubscribed},   {"legacy", k_EItemStateLegacyItem},
+    {"installed", k_EItemStateInstalled},     {"needs_update", k_EItemStateNeedsUpdate},
+    {"downloading", k_EItemStateDownloading}, {"download_pending", k_EItemStateDownloadPending},
 };
 
 struct UpdateStatusName {
@@ -61,7 +61,8 @@ uint32 ParseState(const ScenarioFile& r, const json& value, const std::string& a
             std::string list;
             for (const auto& b : kStateBits)
                 list += std::string(list.empty() ? "" : ", ") + b.name;
-            r.Fail(ScenarioFile::Child(at, i), "unknown item state \"" + name + "\"; expected one of: " + list);
+            r.Fail(ScenarioFile::Child(at, i),
+                   "unknown item state \"" + name + "\"; expected one of: " + list);
         }
         state |= found->bit;
     }
@@ -110,7 +111,8 @@ WorldEdit ParseItems(const ScenarioFile& r, const json& value, const std::string
         item.description = OptionalString(r, entry, at, "description");
         item.tags = OptionalString(r, entry, at, "tags");
         item.folder = OptionalString(r, entry, at, "folder");
-        item.subscribed = entry.contains("subscribed") && r.Bool(entry["subscribed"], Child(at, "subscribed"));
+        item.subscribed =
+            entry.contains("subscribed") && r.Bool(entry["subscribed"], Child(at, "subscribed"));
         if (entry.contains("state"))
             item.state = ParseState(r, entry["state"], Child(at, "state"));
         if (entry.contains("result"))
@@ -120,8 +122,8 @@ WorldEdit ParseItems(const ScenarioFile& r, const json& value, const std::string
                 r.Int(entry["visibility"], Child(at, "visibility"), 0, 3));
         item.bytesDownloaded = OptionalUInt64(r, entry, at, "bytes_downloaded");
         item.bytesTotal = OptionalUInt64(r, entry, at, "bytes_total");
-        item.installInfoFails =
-            entry.contains("install_info_fails") && r.Bool(entry["install_info_fails"], Child(at, "install_info_fails"));
+        item.installInfoFails = entry.contains("install_info_fails") &&
+                                r.Bool(entry["install_info_fails"], Child(at, "install_info_fails"));
         items.push_back(item);
     }
     std::string ids;

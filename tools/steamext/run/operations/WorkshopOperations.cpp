@@ -44,17 +44,22 @@ void RegisterWorkshopOperations(OperationTable& table)
     table.Add({"workshop.GetItemCount", {}, ResultType::Int, [](const CallTarget& t, const Args&) {
                    return IntResult(Workshop(t)->GetItemCount());
                }});
-    table.Add({"workshop.GetItem",
-               {{"index", ArgType::Int}},
-               ResultType::Record,
-               [](const CallTarget& t, const Args& a) { return RecordResult(Workshop(t)->GetItem(a[0].number)); },
-               &kItemLayout});
-    table.Add({"workshop.SubscribeItem", {{"id", ArgType::Text}}, ResultType::None,
+    table.Add(
+        {"workshop.GetItem",
+         {{"index", ArgType::Int}},
+         ResultType::Record,
+         [](const CallTarget& t, const Args& a) { return RecordResult(Workshop(t)->GetItem(a[0].number)); },
+         &kItemLayout});
+    table.Add({"workshop.SubscribeItem",
+               {{"id", ArgType::Text}},
+               ResultType::None,
                [](const CallTarget& t, const Args& a) {
                    Workshop(t)->SubscribeItem(TextArg(a[0]));
                    return NoResult();
                }});
-    table.Add({"workshop.UnsubscribeItem", {{"id", ArgType::Text}}, ResultType::None,
+    table.Add({"workshop.UnsubscribeItem",
+               {{"id", ArgType::Text}},
+               ResultType::None,
                [](const CallTarget& t, const Args& a) {
                    Workshop(t)->UnsubscribeItem(TextArg(a[0]));
                    return NoResult();
