@@ -211,7 +211,8 @@ public:
         if (pTags && pTags->m_ppStrings)
             for (int32 i = 0; i < pTags->m_nNumStrings; ++i)
                 list += (i ? "," : "") + std::string(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
-        CallScope call(SIM_CALL("SetItemTags"), Args(handle, list));
+        // The count tells an empty list from one empty tag.
+        CallScope call(SIM_CALL("SetItemTags"), Args(handle, pTags ? pTags->m_nNumStrings : -1, list));
         auto found = call.state.updates.find(handle);
         if (call.faults.fail || !pTags || found == call.state.updates.end())
             return false;
@@ -300,6 +301,8 @@ public:
         CallScope call(SIM_CALL("GetNumSubscribedItems"), "");
         if (call.faults.fail)
             return 0;
+        if (call.state.subscribedList)
+            return static_cast<uint32>(call.state.subscribedList->size());
         uint32 n = 0;
         for (const auto& entry : call.state.items)
             n += entry.second.subscribed ? 1 : 0;
@@ -312,6 +315,12 @@ public:
         if (call.faults.fail || !ids)
             return 0;
         uint32 n = 0;
+        if (call.state.subscribedList) {
+            for (PublishedFileId_t id : *call.state.subscribedList)
+                if (n < cMaxEntries)
+                    ids[n++] = id;
+            return n;
+        }
         for (const auto& entry : call.state.items)
             if (entry.second.subscribed && n < cMaxEntries)
                 ids[n++] = entry.first;

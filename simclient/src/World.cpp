@@ -467,6 +467,11 @@ void World::SetWorkshopUpload(std::optional<WorkshopUpload> upload)
     auto l = Lock();
     State().upload = std::move(upload);
 }
+void World::SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids)
+{
+    auto l = Lock();
+    State().subscribedList = std::move(ids);
+}
 void World::SetDetailQueryLimit(uint32 limit)
 {
     auto l = Lock();

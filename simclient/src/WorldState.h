@@ -173,6 +173,7 @@ struct WorldData {
     std::vector<WorkshopSubmission> submissions;
     std::optional<WorkshopUpload> upload;
     uint32 detailQueryLimit = kNumUGCResultsPerPage;
+    std::optional<std::vector<PublishedFileId_t>> subscribedList;
 
     // --- helpers for scheduled actions and the simulated methods ---
     // The absolute point `delay` from now.

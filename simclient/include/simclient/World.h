@@ -256,6 +256,9 @@ public:
     bool StartWorkshopDownload(PublishedFileId_t id, WorkshopDownload download);
     // How the next submissions upload (nullopt: their result comes at the latency, as before).
     void SetWorkshopUpload(std::optional<WorkshopUpload> upload);
+    // The ids GetSubscribedItems gives, in this order and repeats included (nullopt: every
+    // subscribed item once, by id); GetNumSubscribedItems counts them.
+    void SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids);
     // Most ids one detail query takes (the platform's page, 50, by default).
     void SetDetailQueryLimit(uint32 limit);
     // Whether CreateItem / SubmitItemUpdate report that the legal agreement is pending.

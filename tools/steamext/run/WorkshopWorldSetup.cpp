@@ -208,7 +208,8 @@ WorldEdit ParseUpdateProgress(const ScenarioFile& r, const json& value, const st
 
 const std::vector<std::string>& WorkshopWorldKeys()
 {
-    static const std::vector<std::string> kKeys = {"workshop_items", "workshop_downloads", "workshop_upload",
+    static const std::vector<std::string> kKeys = {"workshop_items", "workshop_subscribed_list",
+                                                   "workshop_downloads", "workshop_upload",
                                                    "workshop_update_progress"};
     return kKeys;
 }
@@ -226,6 +227,15 @@ WorldEdit ParseWorkshopWorld(const ScenarioFile& r, const std::string& key, cons
         return ParseItems(r, value, pointer);
     if (key == "workshop_downloads")
         return ParseDownloads(r, value, pointer);
+    if (key == "workshop_subscribed_list") {
+        if (value.is_null())
+            return {"workshop_subscribed_list = null", [](World& w) { w.SetSubscribedList(std::nullopt); }};
+        r.Array(value, pointer);
+        std::vector<PublishedFileId_t> ids;
+        for (std::size_t i = 0; i < value.size(); ++i)
+            ids.push_back(r.UInt64(value[i], ScenarioFile::Child(pointer, i)));
+        return {"workshop_subscribed_list = " + Shown(value), [ids](World& w) { w.SetSubscribedList(ids); }};
+    }
     if (key == "workshop_upload")
         return ParseUpload(r, value, pointer);
     return ParseUpdateProgress(r, value, pointer);
