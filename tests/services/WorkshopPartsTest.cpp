@@ -27,12 +27,12 @@ TEST(WorkshopScaleProgress, SinglePrecisionStepsThenTruncation)
     } rows[] = {
         {0, 1, 5},
         {1, 1, 100},
-        {1, 2, 52},        // 52.5 truncated, not rounded
-        {2, 1, 100},       // clamped at 1
-        {1, 95, 6},        // exact 6
-        {49, 95, 53},      // exact 54; single precision lands just below
-        {53, 95, 58},      // a double-precision shortcut gives 57
-        {56, 95, 61},      // a double-precision shortcut gives 60
+        {1, 2, 52},    // 52.5 truncated, not rounded
+        {2, 1, 100},   // clamped at 1
+        {1, 95, 6},    // exact 6
+        {49, 95, 53},  // exact 54; single precision lands just below
+        {53, 95, 58},  // a double-precision shortcut gives 57
+        {56, 95, 61},  // a double-precision shortcut gives 60
         {94, 95, 99},
         {199, 200, 99},
         {999999, 1000000, 99},
@@ -62,7 +62,8 @@ ReplaceOutcome Replace(const char* source, const char* search, const char* repla
     bool intact = true;
     for (std::size_t i = static_cast<std::size_t>(size > 0 ? size : 0); i < sizeof buffer; ++i)
         intact = intact && buffer[i] == 0x7E;
-    std::string text = result == buffer && buffer[0] != 0x7E ? std::string(buffer) : std::string("<untouched>");
+    std::string text =
+        result == buffer && buffer[0] != 0x7E ? std::string(buffer) : std::string("<untouched>");
     return {result, text, intact};
 }
 

@@ -166,7 +166,11 @@ TEST_F(Workshop, PublicationHandsThePlatformItsData)
         {"empty tags", "", 1, {}, k_ERemoteStoragePublishedFileVisibilityFriendsOnly},
         {"trailing separator", "a,b,", 2, {"a", "b", ""}, k_ERemoteStoragePublishedFileVisibilityPrivate},
         {"empty middle", "a,,b", 3, {"a", "", "b"}, k_ERemoteStoragePublishedFileVisibilityPrivate},
-        {"a tag too long", withLongTag.c_str(), -1, {"", "x"}, k_ERemoteStoragePublishedFileVisibilityPrivate},
+        {"a tag too long",
+         withLongTag.c_str(),
+         -1,
+         {"", "x"},
+         k_ERemoteStoragePublishedFileVisibilityPrivate},
     };
     simclient::WorkshopItem existing;
     existing.id = 555;
