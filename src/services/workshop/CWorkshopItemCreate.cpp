@@ -68,7 +68,10 @@ void PostPublishedEvent(int32_t status)
 
 void CWorkshopItemCreate::CreateItem(UGCItem* item)
 {
-    const SteamAPICall_t call = SteamUGC()->CreateItem(appId, k_EWorkshopFileTypeCommunity);
+    ISteamUGC* ugc = SteamUGC();
+    if (ugc == nullptr)
+        return;
+    const SteamAPICall_t call = ugc->CreateItem(appId, k_EWorkshopFileTypeCommunity);
     currentItem = item;
     HostLogInfo("Creating Steam UGC item '%s'...", item->title);
     item->progress = kProgressCreating;
@@ -82,6 +85,8 @@ void CWorkshopItemCreate::OnCreateItem(CreateItemResult_t* result, bool ioFailur
         PostPublishedEvent(1);
         return;
     }
+    if (currentItem == nullptr)
+        return;  // the record went with the lists; nothing is waiting for this answer
     publishedFileId = result->m_nPublishedFileId;
     // The id is taken whatever the result: a failed creation shows what the platform gave back.
     InlineString id = FormatString("%llu", static_cast<unsigned long long>(publishedFileId));
@@ -98,10 +103,12 @@ void CWorkshopItemCreate::OnCreateItem(CreateItemResult_t* result, bool ioFailur
 
 void CWorkshopItemCreate::UpdateItem(UGCItem* item, const char* changeNote)
 {
+    ISteamUGC* ugc = SteamUGC();
+    if (ugc == nullptr)
+        return;
     HostLogInfo("Updating Steam UGC item '%s'..", item->title);
     currentItem = item;
     publishedFileId = ParseDecimalId(item->id);
-    ISteamUGC* ugc = SteamUGC();
     updateHandle = ugc->StartItemUpdate(appId, publishedFileId);
     ugc->SetItemTitle(updateHandle, item->title);
     ugc->SetItemDescription(updateHandle, item->description);
@@ -128,8 +135,11 @@ void CWorkshopItemCreate::OnSubmitItemUpdate(SubmitItemUpdateResult_t* result, b
         PostPublishedEvent(1);
         return;
     }
-    if (currentItem->subscribeAfterPublish != 0)
-        SteamUGC()->SubscribeItem(publishedFileId);
+    if (currentItem == nullptr)
+        return;  // the record went with the lists; nothing is waiting for this answer
+    ISteamUGC* ugc = SteamUGC();
+    if (currentItem->subscribeAfterPublish != 0 && ugc != nullptr)
+        ugc->SubscribeItem(publishedFileId);
     currentItem->progress = kProgressDone;
     currentItem = nullptr;
     PostPublishedEvent(0);

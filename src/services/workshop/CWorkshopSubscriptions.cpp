@@ -23,6 +23,8 @@ void CWorkshopSubscriptions::RefreshItems()
 {
     listReady.store(0, std::memory_order_release);
     ISteamUGC* ugc = SteamUGC();
+    if (ugc == nullptr)
+        return;
     const uint32_t subscribed = ugc->GetNumSubscribedItems();
     if (subscribed == 0) {
         listReady.store(1, std::memory_order_release);
@@ -79,16 +81,18 @@ UGCItem* CWorkshopSubscriptions::FindListed(const char* id)
 void CWorkshopSubscriptions::SubscribeItem(const char* id)
 {
     UGCItem* item = FindListed(id);
-    if (item != nullptr)
-        SteamUGC()->SubscribeItem(ParseDecimalId(item->id));  // the answer is not awaited
+    ISteamUGC* ugc = SteamUGC();
+    if (item != nullptr && ugc != nullptr)
+        ugc->SubscribeItem(ParseDecimalId(item->id));  // the answer is not awaited
 }
 
 void CWorkshopSubscriptions::UnsubscribeItem(const char* id)
 {
     UGCItem* item = FindListed(id);
-    if (item == nullptr)
+    ISteamUGC* ugc = SteamUGC();
+    if (item == nullptr || ugc == nullptr)
         return;
-    SteamUGC()->UnsubscribeItem(ParseDecimalId(item->id));
+    ugc->UnsubscribeItem(ParseDecimalId(item->id));
     // Parked, not freed: the engine may still hold the pointer until the next rebuild.
     ugcService->LockLists();
     PtrArray<UGCItem>& list = ugcService->subscribedItems;
@@ -101,6 +105,8 @@ void CWorkshopSubscriptions::UnsubscribeItem(const char* id)
 void CWorkshopSubscriptions::OnQueryCompleted(SteamUGCQueryCompleted_t* result, bool ioFailure)
 {
     ISteamUGC* ugc = SteamUGC();
+    if (ugc == nullptr)
+        return;
     if (ioFailure) {
         // The answer is lost, but the query is still ours to free.
         ugc->ReleaseQueryUGCRequest(queryHandle);
@@ -163,8 +169,9 @@ InlineString CWorkshopSubscriptions::GetInstallPath(PublishedFileId_t publishedF
     char folder[kFolderRoom] = {};
     uint64 sizeOnDisk = 0;
     uint32 timeStamp = 0;
-    const bool installed =
-        SteamUGC()->GetItemInstallInfo(publishedFileId, &sizeOnDisk, folder, kFolderRoom, &timeStamp);
+    ISteamUGC* ugc = SteamUGC();
+    const bool installed = ugc != nullptr && ugc->GetItemInstallInfo(publishedFileId, &sizeOnDisk, folder,
+                                                                     kFolderRoom, &timeStamp);
     if (installed && folder[0] == '\0')
         return result;
 

@@ -20,7 +20,7 @@ namespace {
 
 // The platform's public community site; the page lists the items ready to use, most popular first.
 constexpr const char* kWorkshopBrowseAddress =
-    "https://steamcommunity.com/workshop/browse/?appid=%d&browsesort=trend&section=readytouseitems";
+    "http://steamcommunity.com/workshop/browse/?appid=%d&browsesort=trend&section=readytouseitems";
 
 void FreeRecords(PtrArray<UGCItem>& list, const UGCItem* keep)
 {
@@ -126,34 +126,39 @@ bool UGCImplementationSteam::IsAvailable()
     return workshopItemCreate != nullptr && workshopSubscriptions != nullptr;
 }
 
+// The list operations go straight to the companion objects. The engine calls them
+// only once IsAvailable is true; before that they answer as an empty list would.
 void UGCImplementationSteam::RefreshItems()
 {
-    workshopSubscriptions->RefreshItems();
+    if (workshopSubscriptions != nullptr)
+        workshopSubscriptions->RefreshItems();
 }
 
 bool UGCImplementationSteam::IsItemListReady()
 {
-    return workshopSubscriptions->IsItemListReady();
+    return workshopSubscriptions != nullptr && workshopSubscriptions->IsItemListReady();
 }
 
 int32_t UGCImplementationSteam::GetItemCount()
 {
-    return workshopSubscriptions->GetItemCount();
+    return workshopSubscriptions != nullptr ? workshopSubscriptions->GetItemCount() : 0;
 }
 
 UGCItem* UGCImplementationSteam::GetItem(int32_t index)
 {
-    return workshopSubscriptions->GetItem(index);
+    return workshopSubscriptions != nullptr ? workshopSubscriptions->GetItem(index) : nullptr;
 }
 
 void UGCImplementationSteam::SubscribeItem(const char* id)
 {
-    workshopSubscriptions->SubscribeItem(id);
+    if (workshopSubscriptions != nullptr)
+        workshopSubscriptions->SubscribeItem(id);
 }
 
 void UGCImplementationSteam::UnsubscribeItem(const char* id)
 {
-    workshopSubscriptions->UnsubscribeItem(id);
+    if (workshopSubscriptions != nullptr)
+        workshopSubscriptions->UnsubscribeItem(id);
 }
 
 UGCItem* UGCImplementationSteam::PublishItem(const UGCItem* item)
@@ -162,7 +167,7 @@ UGCItem* UGCImplementationSteam::PublishItem(const UGCItem* item)
         item->contentPath == nullptr)
         return nullptr;
     // One publication at a time: a second one would take over the handlers of the first.
-    if (workshopItemCreate->IsPublishing())
+    if (workshopItemCreate == nullptr || workshopItemCreate->IsPublishing() || SteamUGC() == nullptr)
         return nullptr;
 
     auto* copy = new UGCItem(*item);
