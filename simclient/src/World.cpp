@@ -445,7 +445,7 @@ void DownloadStep(WorldData& d, PublishedFileId_t id, const WorkshopDownload& do
 
 }  // namespace
 
-bool World::StartWorkshopDownload(PublishedFileId_t id, WorkshopDownload download)
+bool World::StartWorkshopDownload(PublishedFileId_t id, const WorkshopDownload& download)
 {
     auto l = Lock();
     WorldState& s = State();
@@ -462,10 +462,10 @@ bool World::StartWorkshopDownload(PublishedFileId_t id, WorkshopDownload downloa
     s.SyncQueuedCount();
     return true;
 }
-void World::SetWorkshopUpload(std::optional<WorkshopUpload> upload)
+void World::SetWorkshopUpload(const std::optional<WorkshopUpload>& upload)
 {
     auto l = Lock();
-    State().upload = std::move(upload);
+    State().upload = upload;
 }
 void World::SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids)
 {

@@ -253,9 +253,9 @@ public:
     // What GetItemUpdateProgress reports for any live update handle with no upload running.
     void SetUpdateProgress(EItemUpdateStatus status, uint64 processed, uint64 total);
     // Starts `download` of item `id` from the next step on; false for an unknown item.
-    bool StartWorkshopDownload(PublishedFileId_t id, WorkshopDownload download);
+    bool StartWorkshopDownload(PublishedFileId_t id, const WorkshopDownload& download);
     // How the next submissions upload (nullopt: their result comes at the latency, as before).
-    void SetWorkshopUpload(std::optional<WorkshopUpload> upload);
+    void SetWorkshopUpload(const std::optional<WorkshopUpload>& upload);
     // The ids GetSubscribedItems gives, in this order and repeats included (nullopt: every
     // subscribed item once, by id); GetNumSubscribedItems counts them.
     void SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids);

@@ -1,5 +1,6 @@
 #include "services/workshop/CWorkshopSubscriptions.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "foundation/TextFormat.h"
@@ -247,7 +248,7 @@ char* CWorkshopSubscriptions::ReplaceAllText(const char* source, const char* sea
             break;
         const size_t tail = length - static_cast<size_t>(found - buffer) - searchLength;
         std::memmove(found + replacementLength, found + searchLength, tail + 1);
-        std::memcpy(found, replacement, replacementLength);
+        std::copy_n(replacement, replacementLength, found);  // into the middle: no terminator of its own
         length = length - searchLength + replacementLength;
         from = found + replacementLength;
     }
