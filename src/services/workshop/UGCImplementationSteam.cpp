@@ -66,7 +66,22 @@ void ReplaceItemText(char*& slot, const char* text)
     slot = text != nullptr ? DuplicateText(text) : nullptr;
 }
 
-UGCImplementationSteam::~UGCImplementationSteam() = default;  // the arrays free their blocks, not the records
+// Only the engine destroys the service, as it unloads the module: nothing can read a
+// record after that, so the records go too, and the companions with their pending call
+// results, so that no answer is ever delivered into code that is gone.
+UGCImplementationSteam::~UGCImplementationSteam()
+{
+    FreeRecords(subscribedItems, nullptr);
+    FreeRecords(publishedItems, nullptr);
+    FreeRecords(removedItems, nullptr);
+    if (ugcService != this)
+        return;
+    delete workshopItemCreate;
+    delete workshopSubscriptions;
+    workshopItemCreate = nullptr;
+    workshopSubscriptions = nullptr;
+    ugcService = nullptr;
+}
 
 int32_t UGCImplementationSteam::GetServiceType()
 {
@@ -83,6 +98,9 @@ bool UGCImplementationSteam::Initialize()
     if (SteamUGC() == nullptr)
         return false;
     ugcService = this;
+    // A second start-up starts afresh; the old companions' pending answers are detached with them.
+    delete workshopItemCreate;
+    delete workshopSubscriptions;
     workshopItemCreate = nullptr;
     workshopSubscriptions = nullptr;
 
