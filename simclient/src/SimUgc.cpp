@@ -26,12 +26,61 @@ void SetSubscribed(WorkshopItem& item, bool subscribed)
         item.state &= ~uint32(k_EItemStateSubscribed);
 }
 
+// One planned upload on its way: the update it belongs to, the call whose result ends it.
+struct UploadRun {
+    UGCUpdateHandle_t update;
+    SteamAPICall_t call;
+    WorkshopUpload plan;
+    SubmitItemUpdateResult_t result;
+    bool ioFailure;
+    bool drop;
+};
+
+// Moves the upload on by one stage (or one step of bytes); the last stage queues the result.
+void UploadStep(WorldData& d, const UploadRun& run);
+
+void ScheduleUploadStep(WorldData& d, const UploadRun& run)
+{
+    d.ScheduleAt(d.DueAfter(run.plan.step), [run](WorldData& data) { UploadStep(data, run); });
+}
+
+void UploadStep(WorldData& d, const UploadRun& run)
+{
+    auto found = d.updates.find(run.update);
+    if (found == d.updates.end())
+        return;
+    ItemUpdate& u = found->second;
+    switch (u.status) {
+    case k_EItemUpdateStatusPreparingConfig:
+        u.status = k_EItemUpdateStatusPreparingContent;
+        break;
+    case k_EItemUpdateStatusPreparingContent:
+        u.status = k_EItemUpdateStatusUploadingContent;
+        break;
+    case k_EItemUpdateStatusUploadingContent:
+        u.processed = std::min(u.total, u.processed + run.plan.bytesPerStep);
+        if (u.processed >= u.total)
+            u.status = k_EItemUpdateStatusUploadingPreviewFile;
+        break;
+    case k_EItemUpdateStatusUploadingPreviewFile:
+        u.status = k_EItemUpdateStatusCommittingChanges;
+        break;
+    default:
+        u.ended = true;
+        if (!run.drop)
+            d.PostResultAt(d.pump, run.call, SubmitItemUpdateResult_t::k_iCallback, run.ioFailure,
+                           &run.result, sizeof run.result);
+        return;
+    }
+    ScheduleUploadStep(d, run);
+}
+
 class SimSteamUGC final : public ISteamUGC {
 public:
     UGCQueryHandle_t CreateQueryUGCDetailsRequest(PublishedFileId_t* ids, uint32 count) override
     {
         CallScope call(SIM_CALL("CreateQueryUGCDetailsRequest"), Args(ids, count));
-        if (call.faults.fail || (count > 0 && !ids) || count > kNumUGCResultsPerPage)
+        if (call.faults.fail || (count > 0 && !ids) || count > call.state.detailQueryLimit)
             return k_UGCQueryHandleInvalid;
         UgcQuery query;
         query.ids.assign(ids, ids + count);
@@ -162,7 +211,8 @@ public:
         if (pTags && pTags->m_ppStrings)
             for (int32 i = 0; i < pTags->m_nNumStrings; ++i)
                 list += (i ? "," : "") + std::string(pTags->m_ppStrings[i] ? pTags->m_ppStrings[i] : "");
-        CallScope call(SIM_CALL("SetItemTags"), Args(handle, list));
+        // The count tells an empty list from one empty tag.
+        CallScope call(SIM_CALL("SetItemTags"), Args(handle, pTags ? pTags->m_nNumStrings : -1, list));
         auto found = call.state.updates.find(handle);
         if (call.faults.fail || !pTags || found == call.state.updates.end())
             return false;
@@ -205,20 +255,34 @@ public:
             w.timeUpdated = s.serverTime;
         }
         s.submissions.push_back(submission);
-        return QueueResult(s, result, call.faults);
+        if (!s.upload || call.faults.zeroHandle)
+            return QueueResult(s, result, call.faults);
+        if (!call.faults.result && !call.faults.fail && result.m_eResult == k_EResultOK)
+            result.m_eResult = s.upload->result;
+        const SteamAPICall_t callHandle = s.nextHandle++;
+        ItemUpdate& update = found->second;
+        update.uploading = true;
+        update.status = k_EItemUpdateStatusPreparingConfig;
+        update.processed = 0;
+        update.total = s.upload->contentBytes;  // known from the start, as the content is measured
+        ScheduleUploadStep(
+            s, UploadRun{handle, callHandle, *s.upload, result, call.faults.ioFailure, call.faults.drop});
+        return callHandle;
     }
 
     EItemUpdateStatus GetItemUpdateProgress(UGCUpdateHandle_t handle, uint64* processed,
                                             uint64* total) override
     {
         CallScope call(SIM_CALL("GetItemUpdateProgress"), Args(handle));
-        if (call.faults.fail || !call.state.updates.count(handle))
+        auto found = call.state.updates.find(handle);
+        if (call.faults.fail || found == call.state.updates.end() || found->second.ended)
             return k_EItemUpdateStatusInvalid;
+        const ItemUpdate& update = found->second;
         if (processed)
-            *processed = call.state.updateProcessed;
+            *processed = update.uploading ? update.processed : call.state.updateProcessed;
         if (total)
-            *total = call.state.updateTotal;
-        return call.state.updateStatus;
+            *total = update.uploading ? update.total : call.state.updateTotal;
+        return update.uploading ? update.status : call.state.updateStatus;
     }
 
     SteamAPICall_t SubscribeItem(PublishedFileId_t id) override
@@ -237,6 +301,8 @@ public:
         CallScope call(SIM_CALL("GetNumSubscribedItems"), "");
         if (call.faults.fail)
             return 0;
+        if (call.state.subscribedList)
+            return static_cast<uint32>(call.state.subscribedList->size());
         uint32 n = 0;
         for (const auto& entry : call.state.items)
             n += entry.second.subscribed ? 1 : 0;
@@ -249,6 +315,12 @@ public:
         if (call.faults.fail || !ids)
             return 0;
         uint32 n = 0;
+        if (call.state.subscribedList) {
+            for (PublishedFileId_t id : *call.state.subscribedList)
+                if (n < cMaxEntries)
+                    ids[n++] = id;
+            return n;
+        }
         for (const auto& entry : call.state.items)
             if (entry.second.subscribed && n < cMaxEntries)
                 ids[n++] = entry.first;
@@ -270,7 +342,7 @@ public:
         CallScope call(SIM_CALL("GetItemInstallInfo"), Args(id, cchFolderSize));
         auto found = call.state.items.find(id);
         if (call.faults.fail || found == call.state.items.end() ||
-            !(found->second.state & k_EItemStateInstalled))
+            !(found->second.state & k_EItemStateInstalled) || found->second.installInfoFails)
             return false;
         const WorkshopItem& w = found->second;
         if (sizeOnDisk)
@@ -289,7 +361,9 @@ public:
     {
         CallScope call(SIM_CALL("GetItemDownloadInfo"), Args(id));
         auto found = call.state.items.find(id);
-        if (call.faults.fail || found == call.state.items.end() || found->second.bytesTotal == 0)
+        const uint32 transferring = k_EItemStateNeedsUpdate | k_EItemStateDownloading;
+        if (call.faults.fail || found == call.state.items.end() ||
+            (found->second.bytesTotal == 0 && !(found->second.state & transferring)))
             return false;
         if (downloaded)
             *downloaded = found->second.bytesDownloaded;

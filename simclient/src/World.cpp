@@ -1,6 +1,7 @@
 // The control API: every member takes the world lock for the duration of its own work.
 #include "simclient/World.h"
 
+#include <algorithm>
 #include <stdexcept>
 
 #include "LeaderboardRank.h"
@@ -464,6 +465,66 @@ void World::SetUpdateProgress(EItemUpdateStatus status, uint64 processed, uint64
     State().updateStatus = status;
     State().updateProcessed = processed;
     State().updateTotal = total;
+}
+namespace {
+
+// One step of a planned download (World::StartWorkshopDownload).
+void DownloadStep(WorldData& d, PublishedFileId_t id, const WorkshopDownload& download)
+{
+    auto found = d.items.find(id);
+    if (found == d.items.end())
+        return;
+    WorkshopItem& item = found->second;
+    const uint32 subscribed = item.state & k_EItemStateSubscribed;
+    if (item.state & k_EItemStateDownloadPending)
+        item.state = subscribed | k_EItemStateNeedsUpdate | k_EItemStateDownloading;
+    else
+        item.bytesDownloaded = std::min(item.bytesTotal, item.bytesDownloaded + download.bytesPerStep);
+    if (item.bytesTotal > 0 && item.bytesDownloaded >= item.bytesTotal) {
+        item.state = subscribed | k_EItemStateInstalled;
+        item.folder = download.folder;
+        item.sizeOnDisk = item.bytesTotal;
+        return;
+    }
+    if (item.bytesTotal == 0 && download.bytesPerStep == 0)
+        return;  // a download that never moves: stays at 0 of 0
+    d.ScheduleAt(d.DueAfter(download.step),
+                 [id, download](WorldData& data) { DownloadStep(data, id, download); });
+}
+
+}  // namespace
+
+bool World::StartWorkshopDownload(PublishedFileId_t id, const WorkshopDownload& download)
+{
+    auto l = Lock();
+    WorldState& s = State();
+    auto found = s.items.find(id);
+    if (found == s.items.end())
+        return false;
+    WorkshopItem& item = found->second;
+    item.state = (item.state & k_EItemStateSubscribed) | k_EItemStateDownloadPending;
+    item.folder.clear();
+    item.bytesDownloaded = 0;
+    item.bytesTotal = download.bytesTotal;
+    s.ScheduleAt(s.DueAfter(download.step),
+                 [id, download](WorldData& data) { DownloadStep(data, id, download); });
+    s.SyncQueuedCount();
+    return true;
+}
+void World::SetWorkshopUpload(const std::optional<WorkshopUpload>& upload)
+{
+    auto l = Lock();
+    State().upload = upload;
+}
+void World::SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids)
+{
+    auto l = Lock();
+    State().subscribedList = std::move(ids);
+}
+void World::SetDetailQueryLimit(uint32 limit)
+{
+    auto l = Lock();
+    State().detailQueryLimit = limit;
 }
 void World::SetNeedsLegalAgreement(bool needs)
 {

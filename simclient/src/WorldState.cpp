@@ -39,6 +39,18 @@ void WorldData::PostAt(uint64 dueAtPump, int callbackId, const void* data, std::
     queue.push_back(std::move(p));
 }
 
+void WorldData::PostResultAt(uint64 dueAtPump, SteamAPICall_t handle, int callbackId, bool ioFailure,
+                             const void* data, std::size_t size)
+{
+    Pending p;
+    p.dueAtPump = dueAtPump;
+    p.callbackId = callbackId;
+    p.handle = handle;
+    p.ioFailure = ioFailure;
+    p.payload.assign(static_cast<const uint8*>(data), static_cast<const uint8*>(data) + size);
+    queue.push_back(std::move(p));
+}
+
 std::vector<Scheduled> WorldState::TakeDueActions(bool haveTime)
 {
     std::vector<Scheduled> due;

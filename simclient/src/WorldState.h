@@ -67,6 +67,10 @@ struct UgcQuery {
 
 struct ItemUpdate {
     WorkshopSubmission pending;
+    bool uploading = false;  // a planned upload runs: the fields below are what it reports
+    bool ended = false;      // its result has been queued: the handle reports Invalid
+    EItemUpdateStatus status = k_EItemUpdateStatusInvalid;
+    uint64 processed = 0, total = 0;
 };
 
 // The name of a journaled call, checked against kCallNames when compiled:
@@ -172,6 +176,9 @@ struct WorldData {
     uint64 updateProcessed = 0, updateTotal = 0;
     bool needsLegalAgreement = false;
     std::vector<WorkshopSubmission> submissions;
+    std::optional<WorkshopUpload> upload;
+    uint32 detailQueryLimit = kNumUGCResultsPerPage;
+    std::optional<std::vector<PublishedFileId_t>> subscribedList;
 
     // --- helpers for scheduled actions and the simulated methods ---
     // The absolute point `delay` from now.
@@ -197,6 +204,9 @@ struct WorldData {
     template <class T> void PostNow(const T& data) { PostAt(pump, T::k_iCallback, &data, sizeof(T)); }
     // Queues a broadcast callback for the pump `dueAtPump`.
     void PostAt(uint64 dueAtPump, int callbackId, const void* data, std::size_t size);
+    // Queues the result of call `handle` for the pump `dueAtPump`.
+    void PostResultAt(uint64 dueAtPump, SteamAPICall_t handle, int callbackId, bool ioFailure,
+                      const void* data, std::size_t size);
 };
 
 // The world: its data, plus what outlives a Reset.

@@ -10,6 +10,7 @@
 #include "services/cloud/CloudImplementationSteam.h"
 #include "services/leaderboards/SteamLeaderboardsImplementation.h"
 #include "services/store/InAppPurchaseSteam.h"
+#include "services/workshop/UGCImplementationSteam.h"
 
 const char* ExtensionModuleSteam::GetName()
 {
@@ -67,8 +68,8 @@ BaseImplementation* ExtensionModuleSteam::GetImplementation(int32_t serviceNumbe
         return achievements;
     case kServiceStore:
         return inAppPurchase;
-    // Workshop (6) is not built yet: its
-    // fields stay null, as before a successful Initialize.
+    case kServiceWorkshop:
+        return ugc;
     default:
         return nullptr;
     }
@@ -82,4 +83,5 @@ void ExtensionModuleSteam::CreateServices()
     leaderboards = new SteamLeaderboardsImplementation();
     cloud = new CloudImplementationSteam();
     achievements = new AchievementImplementationSteam();
+    ugc = new UGCImplementationSteam();
 }

@@ -99,7 +99,7 @@ TEST_F(ModuleLifecycle, GoodStartUp)
     // Once by the statistics object, once by the start-up itself.
     EXPECT_EQ(journal.Count("RequestCurrentStats"), 2u);
     EXPECT_EQ(engine.Records().All().ThreadStarts().at(0).name, "SteamStats_Updater");
-    for (int32_t number : {1, 2, 3, 4}) {
+    for (int32_t number : {1, 2, 3, 4, 6}) {
         SCOPED_TRACE(number);
         BaseImplementation* service = module->GetImplementation(number);
         ASSERT_NE(service, nullptr);

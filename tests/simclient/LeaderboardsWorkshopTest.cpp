@@ -258,4 +258,58 @@ TEST_F(LeaderboardsWorkshop, CreateAndSubmitItem)
     EXPECT_EQ(world.Submissions()[0].changeNote, "note");
 }
 
+// A planned download passes pending, then downloading with rising bytes, and ends
+// installed in its folder; a planned upload walks its statuses, then answers.
+TEST_F(LeaderboardsWorkshop, DownloadAndUploadMoveByThemselves)
+{
+    ISteamUGC* ugc = SteamUGC();
+    simclient::WorkshopItem item;
+    item.id = 90;
+    item.subscribed = true;
+    world.AddWorkshopItem(item);
+    ASSERT_TRUE(world.StartWorkshopDownload(90, {20, 10, simclient::Delay::Pumps(1), "/ugc/90"}));
+    const uint32 sub = k_EItemStateSubscribed;
+    struct Seen {
+        uint32 state;
+        uint64 done;
+    } expected[] = {{sub | k_EItemStateDownloadPending, 0},
+                    {sub | k_EItemStateNeedsUpdate | k_EItemStateDownloading, 0},
+                    {sub | k_EItemStateNeedsUpdate | k_EItemStateDownloading, 10},
+                    {sub | k_EItemStateInstalled, 20}};
+    for (const Seen& row : expected) {
+        SCOPED_TRACE(row.state);
+        EXPECT_EQ(ugc->GetItemState(90), row.state);
+        uint64 done = 99, total = 0;
+        EXPECT_TRUE(ugc->GetItemDownloadInfo(90, &done, &total));
+        EXPECT_EQ(done, row.done);
+        EXPECT_EQ(total, 20u);
+        SteamAPI_RunCallbacks();
+    }
+    char folder[16] = {};
+    EXPECT_TRUE(ugc->GetItemInstallInfo(90, nullptr, folder, sizeof folder, nullptr));
+    EXPECT_STREQ(folder, "/ugc/90");
+
+    world.SetWorkshopUpload(
+        simclient::WorkshopUpload{4, 2, simclient::Delay::Pumps(1), k_EResultLimitExceeded});
+    UGCUpdateHandle_t u = ugc->StartItemUpdate(480, 90);
+    ResultCatcher<SubmitItemUpdateResult_t> catcher(ugc->SubmitItemUpdate(u, "note"));
+    const EItemUpdateStatus statuses[] = {
+        k_EItemUpdateStatusPreparingConfig,      k_EItemUpdateStatusPreparingContent,
+        k_EItemUpdateStatusUploadingContent,     k_EItemUpdateStatusUploadingContent,
+        k_EItemUpdateStatusUploadingPreviewFile, k_EItemUpdateStatusCommittingChanges};
+    const uint64 bytes[] = {0, 0, 0, 2, 4, 4};
+    for (int i = 0; i < 6; ++i) {
+        SCOPED_TRACE(i);
+        uint64 done = 99, total = 0;
+        EXPECT_EQ(ugc->GetItemUpdateProgress(u, &done, &total), statuses[i]);
+        EXPECT_EQ(done, bytes[i]);
+        EXPECT_EQ(total, 4u);
+        EXPECT_EQ(catcher.calls, 0);
+        SteamAPI_RunCallbacks();
+    }
+    EXPECT_EQ(catcher.calls, 1);
+    EXPECT_EQ(catcher.last.m_eResult, k_EResultLimitExceeded);
+    EXPECT_EQ(ugc->GetItemUpdateProgress(u, nullptr, nullptr), k_EItemUpdateStatusInvalid);
+}
+
 }  // namespace

@@ -82,6 +82,29 @@ struct WorkshopItem {
     uint32 installTimestamp = 0;
     uint64 bytesDownloaded = 0;
     uint64 bytesTotal = 0;
+    bool installInfoFails = false;  // GetItemInstallInfo answers false even when installed
+};
+
+// A download that the platform runs by itself: the item waits (DownloadPending), then
+// downloads (NeedsUpdate | Downloading) `bytesPerStep` more every `step`, and ends
+// installed in `folder` with every byte there.
+struct WorkshopDownload {
+    uint64 bytesTotal = 0;
+    uint64 bytesPerStep = 0;
+    Delay step = Delay::Pumps(1);
+    std::string folder;
+};
+
+// How a SubmitItemUpdate goes on: every `step` the update moves on, through
+// PreparingConfig, PreparingContent, UploadingContent (`bytesPerStep` more each step
+// until `contentBytes`), UploadingPreviewFile and CommittingChanges, reporting
+// `contentBytes` as the total throughout; then its result arrives (`result`, unless a
+// fault says otherwise) and the handle reports Invalid.
+struct WorkshopUpload {
+    uint64 contentBytes = 0;
+    uint64 bytesPerStep = 0;
+    Delay step = Delay::Pumps(1);
+    EResult result = k_EResultOK;
 };
 
 // What one SubmitItemUpdate carried.
@@ -264,8 +287,17 @@ public:
     // --- Workshop ------------------------------------------------------------------------------
     void AddWorkshopItem(WorkshopItem item);
     std::optional<WorkshopItem> GetWorkshopItem(PublishedFileId_t id) const;
-    // What GetItemUpdateProgress reports for any live update handle.
+    // What GetItemUpdateProgress reports for any live update handle with no upload running.
     void SetUpdateProgress(EItemUpdateStatus status, uint64 processed, uint64 total);
+    // Starts `download` of item `id` from the next step on; false for an unknown item.
+    bool StartWorkshopDownload(PublishedFileId_t id, const WorkshopDownload& download);
+    // How the next submissions upload (nullopt: their result comes at the latency, as before).
+    void SetWorkshopUpload(const std::optional<WorkshopUpload>& upload);
+    // The ids GetSubscribedItems gives, in this order and repeats included (nullopt: every
+    // subscribed item once, by id); GetNumSubscribedItems counts them.
+    void SetSubscribedList(std::optional<std::vector<PublishedFileId_t>> ids);
+    // Most ids one detail query takes (the platform's page, 50, by default).
+    void SetDetailQueryLimit(uint32 limit);
     // Whether CreateItem / SubmitItemUpdate report that the legal agreement is pending.
     void SetNeedsLegalAgreement(bool needs);
     std::vector<WorkshopSubmission> Submissions() const;

@@ -148,6 +148,7 @@ const OperationTable& Operations()
         RegisterCloudOperations(built);
         RegisterStoreOperations(built);
         RegisterLeaderboardOperations(built);
+        RegisterWorkshopOperations(built);
         return built;
     }();
     return table;

@@ -145,5 +145,6 @@ void RegisterAchievementOperations(OperationTable& table);
 void RegisterCloudOperations(OperationTable& table);
 void RegisterStoreOperations(OperationTable& table);
 void RegisterLeaderboardOperations(OperationTable& table);
+void RegisterWorkshopOperations(OperationTable& table);
 
 }  // namespace steamext::run

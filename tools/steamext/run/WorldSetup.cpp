@@ -3,6 +3,7 @@
 #include <simclient/World.h>
 
 #include "run/StoreWorldSetup.h"
+#include "run/WorkshopWorldSetup.h"
 #include "run/WorldLeaderboards.h"
 
 namespace steamext::run {
@@ -181,38 +182,46 @@ WorldEdit ParseCloudFiles(const ScenarioFile& r, const json& value, const std::s
             }};
 }
 
+// The state keys, the workshop's after them, then the faults and actions.
+std::vector<std::string> WithWorkshopKeys(std::vector<std::string> state,
+                                          const std::vector<std::string>& actions)
+{
+    const auto& workshop = WorkshopWorldKeys();
+    state.insert(state.end(), workshop.begin(), workshop.end());
+    state.insert(state.end(), actions.begin(), actions.end());
+    return state;
+}
+
 }  // namespace
 
 std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, const std::string& pointer)
 {
     r.Object(world, pointer);
-    static const std::vector<std::string> kKeys = {"steam_running",
-                                                   "init_succeeds",
-                                                   "interfaces",
-                                                   "user",
-                                                   "app_id",
-                                                   "overlay_enabled",
-                                                   "server_time",
-                                                   "language",
-                                                   "branch",
-                                                   "latency",
-                                                   "stats",
-                                                   "achievements",
-                                                   "stats_received_result",
-                                                   "stats_stored_result",
-                                                   "cloud_files",
-                                                   "dlcs",
-                                                   "dlc_installed",
-                                                   "store_visit",
-                                                   "leaderboards",
-                                                   "friends",
-                                                   "personas",
-                                                   "all_names_arrive",
-                                                   "fault_seed",
-                                                   "clear_faults",
-                                                   "faults",
-                                                   "overlay_active",
-                                                   "warning"};
+    static const std::vector<std::string> kKeys =
+        WithWorkshopKeys({"steam_running",
+                          "init_succeeds",
+                          "interfaces",
+                          "user",
+                          "app_id",
+                          "overlay_enabled",
+                          "server_time",
+                          "language",
+                          "branch",
+                          "latency",
+                          "stats",
+                          "achievements",
+                          "stats_received_result",
+                          "stats_stored_result",
+                          "cloud_files",
+                          "dlcs",
+                          "dlc_installed",
+                          "store_visit",
+                          "leaderboards",
+                          "friends",
+                          "personas",
+                          "all_names_arrive",
+                          "fault_seed"},
+                         {"clear_faults", "faults", "overlay_active", "warning"});
     r.OnlyKeys(world, pointer, kKeys);
     std::vector<WorldEdit> edits;
     // Keys apply in the order of kKeys, whatever their order in the file: the
@@ -292,6 +301,8 @@ std::vector<WorldEdit> ParseWorld(const ScenarioFile& r, const json& world, cons
         } else if (key == "fault_seed") {
             uint64 seed = r.UInt64(value, at);
             edits.push_back({shown, [seed](World& w) { w.SetFaultSeed(seed); }});
+        } else if (IsWorkshopWorldKey(key)) {
+            edits.push_back(ParseWorkshopWorld(r, key, value, at));
         } else if (key == "faults") {
             edits.push_back(ParseFaults(r, value, at));
         } else if (key == "clear_faults") {
