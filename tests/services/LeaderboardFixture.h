@@ -50,6 +50,10 @@ protected:
         ASSERT_NE(service, nullptr);
         ASSERT_TRUE(service->Initialize());
         engine.Threads().Join(kConfigThread);
+        // The queue threads must be asleep before anything is queued: one that has
+        // found its queue empty but not yet slept would sleep through the first step.
+        ASSERT_TRUE(engine.Time().WaitUntilSleeping(kRequestThread));
+        ASSERT_TRUE(engine.Time().WaitUntilSleeping(kSubmitThread));
         module->Update();
     }
 
