@@ -20,7 +20,7 @@ namespace {
 
 // The platform's public community site; the page lists the items ready to use, most popular first.
 constexpr const char* kWorkshopBrowseAddress =
-    "http://steamcommunity.com/workshop/browse/?appid=%d&browsesort=trend&section=readytouseitems";
+    "https://steamcommunity.com/workshop/browse/?appid=%d&browsesort=trend&section=readytouseitems";
 
 void FreeRecords(PtrArray<UGCItem>& list, const UGCItem* keep)
 {
