@@ -6,6 +6,7 @@
 
 #include <steam/steam_api.h>
 
+#include "foundation/DecimalText.h"
 #include "foundation/InlineString.h"
 #include "foundation/ListToken.h"
 #include "foundation/TextFormat.h"
@@ -42,11 +43,6 @@ InlineString TakeToken(const char* list, const char* separator, int32_t index)
     return token;
 }
 
-int32_t TextToInteger(const char* text)
-{
-    return static_cast<int32_t>(std::strtol(text, nullptr, 10));
-}
-
 // Statistics reached through this channel carry the prefix "stat_" on the platform.
 InlineString StatisticKey(const char* name)
 {
@@ -61,7 +57,7 @@ const char* OpenStoreWithAppId(const char* argument)
     InlineString token = TakeToken(argument, ";", 0);
     bool hasToken = token.text != nullptr && token.text[0] != '\0';
     if (hasToken) {
-        AppId_t appId = static_cast<AppId_t>(TextToInteger(token.text));
+        AppId_t appId = static_cast<AppId_t>(DecimalToInt32(token.text));
         if (SteamUtils() != nullptr && SteamUtils()->IsOverlayEnabled()) {
             if (SteamFriends() != nullptr)
                 SteamFriends()->ActivateGameOverlayToStore(appId, k_EOverlayToStoreFlag_None);
@@ -119,7 +115,7 @@ const char* SetStatisticsInt(const char* argument)
 {
     InlineString name = TakeToken(argument, ",", 1);
     InlineString valueText = TakeToken(argument, ",", 2);
-    int32_t value = valueText.text != nullptr ? TextToInteger(valueText.text) : 0;
+    int32_t value = valueText.text != nullptr ? DecimalToInt32(valueText.text) : 0;
     if (steamManager.initialised) {
         InlineString key = StatisticKey(name.text);
         // Stored later by the updater thread, not here.

@@ -2,6 +2,7 @@
 
 #include <cstring>
 
+#include "foundation/DecimalText.h"
 #include "foundation/ListToken.h"
 #include "foundation/TextFormat.h"
 #include "host/HostServices.h"
@@ -169,7 +170,7 @@ void InAppPurchaseSteam::OnOverlayActivated(GameOverlayActivated_t* param)
     if (pendingSteamId.Text() == nullptr || pendingSteamId.Text()[0] == '\0')
         return;
     ISteamApps* apps = SteamApps();
-    const AppId_t productNumber = static_cast<AppId_t>(ParseProductNumber(pendingSteamId.Text()));
+    const AppId_t productNumber = static_cast<AppId_t>(DecimalToInt32(pendingSteamId.Text()));
     // An installed product is reported by the scan, not here.
     if (apps != nullptr && !apps->BIsDlcInstalled(productNumber))
         PostPurchaseOutcome(nullptr);

@@ -1,5 +1,6 @@
 #include "services/workshop/CWorkshopItemCreate.h"
 
+#include "foundation/DecimalText.h"
 #include "foundation/InlineString.h"
 #include "foundation/ListToken.h"
 #include "foundation/TextFormat.h"
@@ -108,7 +109,7 @@ void CWorkshopItemCreate::UpdateItem(UGCItem* item, const char* changeNote)
         return;
     HostLogInfo("Updating Steam UGC item '%s'..", item->title);
     currentItem = item;
-    publishedFileId = ParseDecimalId(item->id);
+    publishedFileId = DecimalToUInt64(item->id);
     updateHandle = ugc->StartItemUpdate(appId, publishedFileId);
     ugc->SetItemTitle(updateHandle, item->title);
     ugc->SetItemDescription(updateHandle, item->description);

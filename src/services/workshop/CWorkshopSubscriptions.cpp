@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "foundation/DecimalText.h"
 #include "foundation/TextFormat.h"
 #include "host/HostReport.h"
 #include "services/workshop/UGCImplementationSteam.h"
@@ -84,7 +85,7 @@ void CWorkshopSubscriptions::SubscribeItem(const char* id)
     UGCItem* item = FindListed(id);
     ISteamUGC* ugc = SteamUGC();
     if (item != nullptr && ugc != nullptr)
-        ugc->SubscribeItem(ParseDecimalId(item->id));  // the answer is not awaited
+        ugc->SubscribeItem(DecimalToUInt64(item->id));  // the answer is not awaited
 }
 
 void CWorkshopSubscriptions::UnsubscribeItem(const char* id)
@@ -93,7 +94,7 @@ void CWorkshopSubscriptions::UnsubscribeItem(const char* id)
     ISteamUGC* ugc = SteamUGC();
     if (item == nullptr || ugc == nullptr)
         return;
-    ugc->UnsubscribeItem(ParseDecimalId(item->id));
+    ugc->UnsubscribeItem(DecimalToUInt64(item->id));
     // Parked, not freed: the engine may still hold the pointer until the next rebuild.
     ugcService->LockLists();
     PtrArray<UGCItem>& list = ugcService->subscribedItems;

@@ -5,6 +5,7 @@
 
 #include <steam/steam_api.h>
 
+#include "foundation/DecimalText.h"
 #include "foundation/TextFormat.h"
 #include "foundation/TextHeap.h"
 #include "host/HostReport.h"
@@ -36,11 +37,6 @@ void FreeRecords(PtrArray<UGCItem>& list, const UGCItem* keep)
 }
 
 }  // namespace
-
-uint64_t ParseDecimalId(const char* text)
-{
-    return text != nullptr ? std::strtoull(text, nullptr, 10) : 0;
-}
 
 UGCItem* NewUGCItem()
 {
@@ -108,7 +104,7 @@ bool UGCImplementationSteam::Initialize()
     listMutex = threads != nullptr ? threads->CreateMutex("STEAM_UGC") : nullptr;
 
     const char* value = hostServices != nullptr ? hostServices->GetProductValue("steam_app_id") : nullptr;
-    appId = value != nullptr ? static_cast<uint32_t>(std::strtoul(value, nullptr, 10)) : 0;
+    appId = static_cast<uint32_t>(DecimalToInt32(value));
     if (appId == 0) {
         HostLog(kHostLogError, "Not able to read Steam app id from product values. Not initializing UGC.");
         return false;
@@ -131,7 +127,7 @@ void UGCImplementationSteam::Update()
         for (UGCItem* item : *list) {
             if (item->id == nullptr)
                 continue;  // not created by the platform yet: nothing to ask about
-            const uint64_t publishedFileId = ParseDecimalId(item->id);
+            const uint64_t publishedFileId = DecimalToUInt64(item->id);
             workshopSubscriptions->DownloadStep(item, publishedFileId);
             workshopItemCreate->UploadStep(item);  // after the download step: it has the last word
         }

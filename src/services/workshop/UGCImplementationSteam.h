@@ -57,10 +57,6 @@ extern UGCImplementationSteam* ugcService;
 extern CWorkshopItemCreate* workshopItemCreate;
 extern CWorkshopSubscriptions* workshopSubscriptions;
 
-// Decimal text to a number as the platform's ids and the app id are written:
-// leading white space and a sign accepted, stops at the first other character,
-// no digits give 0.
-uint64_t ParseDecimalId(const char* text);
 // A record with every text null, private, not subscribing, progress 0.
 UGCItem* NewUGCItem();
 // Frees the six texts of `item`, then the record.

@@ -9,7 +9,7 @@
 
 #include "data/Database.h"
 #include "data/XmlReader.h"
-#include "services/store/ProductNumber.h"
+#include "foundation/DecimalText.h"
 
 namespace datatool {
 
@@ -92,7 +92,7 @@ public:
 void CheckValue(Reporter& report, int line, const std::string& item, const char* text)
 {
     const std::string shown = std::string("\"steam_id\" \"") + text + "\"";
-    const int32_t number = ParseProductNumber(text);
+    const int32_t number = DecimalToInt32(text);
     if (number == 0) {
         report.Warn(line, item + ": " + shown + " reads as 0: the item is not sold");
         return;
@@ -144,7 +144,7 @@ std::vector<DataWarning> WarnInAppPurchases(const std::string& path, const std::
             continue;
         }
         CheckValue(report, line, item, value);
-        const int32_t number = ParseProductNumber(value);
+        const int32_t number = DecimalToInt32(value);
         if (number != 0 && id != std::to_string(number))
             report.Warn(line, item + " is product " + std::to_string(number) + " but its id is not \"" +
                                   std::to_string(number) + "\": a purchase of it is never reported");
