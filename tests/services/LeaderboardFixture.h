@@ -50,11 +50,16 @@ protected:
         ASSERT_NE(service, nullptr);
         ASSERT_TRUE(service->Initialize());
         engine.Threads().Join(kConfigThread);
-        // The queue threads must be asleep before anything is queued: one that has
-        // found its queue empty but not yet slept would sleep through the first step.
+        AwaitQueueThreadsAsleep();
+        module->Update();
+    }
+
+    // The queue threads must be asleep before anything is queued: one that has
+    // found its queue empty but not yet slept would sleep through the first step.
+    void AwaitQueueThreadsAsleep()
+    {
         ASSERT_TRUE(engine.Time().WaitUntilSleeping(kRequestThread));
         ASSERT_TRUE(engine.Time().WaitUntilSleeping(kSubmitThread));
-        module->Update();
     }
 
     // Wakes the queue threads for one pass of everything queued.

@@ -32,6 +32,7 @@ TEST_F(LeaderboardTest, OperationsInTableOrder)
     engine.Files().AddMemoryFile(kConfigPath, ConfigWith({"id=\"Speed\""}));
     EXPECT_TRUE(CallSlot<bool>(object, 4));
     engine.Threads().Join(kConfigThread);
+    AwaitQueueThreadsAsleep();
     module->Update();
     CallSlot<void>(object, 5);
     CallSlot<void>(object, 6);

@@ -154,6 +154,7 @@ TEST_F(LeaderboardTest, RequestBeforeTheFindIsLostInSilence)
     service = ServiceAt<LeaderboardsImplementation>(2);
     ASSERT_TRUE(service->Initialize());
     engine.Threads().Join(kConfigThread);
+    AwaitQueueThreadsAsleep();
     EXPECT_TRUE(service->RequestScores(1, 5, 0, "Late"));  // found, but no handle yet
     ServeQueues();
     DeliverAndJoin();  // the find arrives now
