@@ -37,3 +37,11 @@ char* GetListToken(char* buffer, int32_t size, const char* list, const char* sep
     buffer[tokenLength] = '\0';
     return buffer;
 }
+
+int32_t CountListTokens(const char* list, char separator)
+{
+    int32_t count = 1;
+    for (const char* at = list; *at != '\0'; ++at)
+        count += *at == separator ? 1 : 0;
+    return count;
+}

@@ -86,4 +86,14 @@ TEST(GetListToken, BufferSizeAndNullArguments)
     }
 }
 
+TEST(CountListTokens, OneMoreThanTheSeparatorsATrailingOneIncluded)
+{
+    EXPECT_EQ(CountListTokens("", ','), 1);
+    EXPECT_EQ(CountListTokens("a", ','), 1);
+    EXPECT_EQ(CountListTokens("a,b", ','), 2);
+    EXPECT_EQ(CountListTokens("a,b,", ','), 3);
+    EXPECT_EQ(CountListTokens(",,", ','), 3);
+    EXPECT_EQ(CountListTokens("a;b,c", ';'), 2);
+}
+
 }  // namespace

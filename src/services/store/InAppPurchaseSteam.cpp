@@ -21,14 +21,12 @@ constexpr int32_t kScanIntervalMs = 2000;
 const char kOverlayPurchaseAddress[] = "steam://purchase/%s";
 const char kWebStoreAddress[] = "https://store.steampowered.com/app/%s";
 
-int32_t CountTokens(const char* list)
+// The product at `index` of the app's list; false when the platform gives none.
+// The name buffer is the platform's to fill; nothing reads it.
+bool ProductAt(ISteamApps* apps, int index, AppId_t& productNumber, bool& available)
 {
-    int32_t count = 1;
-    for (const char* at = list; *at != '\0'; ++at) {
-        if (*at == ',')
-            ++count;
-    }
-    return count;
+    char name[kDlcNameBufferSize];
+    return apps->BGetDLCDataByIndex(index, &productNumber, &available, name, kDlcNameBufferSize);
 }
 
 }  // namespace
@@ -97,7 +95,7 @@ void InAppPurchaseSteam::QueryItems(const char* list)
     if (apps == nullptr || list == nullptr || list[0] == '\0')
         return;
     // A separator at the very end still counts: its token is empty and finds nothing.
-    const int32_t tokens = CountTokens(list);
+    const int32_t tokens = CountListTokens(list, ',');
     for (int32_t index = 0; index < tokens; ++index) {
         char buffer[kTokenBufferSize];
         InlineString itemId;
@@ -148,8 +146,7 @@ void InAppPurchaseSteam::ListItems()
     for (int index = 0; index < count; ++index) {
         AppId_t productNumber = 0;
         bool available = false;
-        char name[kDlcNameBufferSize];
-        if (!apps->BGetDLCDataByIndex(index, &productNumber, &available, name, kDlcNameBufferSize))
+        if (!ProductAt(apps, index, productNumber, available))
             continue;
         char key[16];
         FormatToBuffer(key, sizeof key, "%d", static_cast<int32_t>(productNumber));
@@ -196,8 +193,7 @@ void InAppPurchaseSteam::CheckPurchases()
     for (int index = 0; index < count; ++index) {
         AppId_t productNumber = 0;
         bool available = false;
-        char name[kDlcNameBufferSize];
-        if (!apps->BGetDLCDataByIndex(index, &productNumber, &available, name, kDlcNameBufferSize))
+        if (!ProductAt(apps, index, productNumber, available))
             productNumber = 0;
         if (!apps->BIsDlcInstalled(productNumber))
             continue;

@@ -26,21 +26,12 @@ ERemoteStoragePublishedFileVisibility PlatformVisibility(int32_t visibility)
     }
 }
 
-// One more token than separators, a separator at the very end included.
-int32_t CountTags(const char* tags)
-{
-    int32_t count = 1;
-    for (const char* at = tags; *at != '\0'; ++at)
-        count += *at == ',' ? 1 : 0;
-    return count;
-}
-
 // Hands the item's tags to the platform, an empty list for none; a refusal is logged and not fatal.
 void SetTags(ISteamUGC* ugc, UGCUpdateHandle_t handle, const char* tags)
 {
     SteamParamStringArray_t list{nullptr, 0};
     if (tags != nullptr && tags[0] != '\0') {
-        const int32_t count = CountTags(tags);
+        const int32_t count = CountListTokens(tags, ',');
         auto** strings = new const char*[count];
         char token[kTagRoom];
         for (int32_t i = 0; i < count; ++i)

@@ -14,6 +14,18 @@ namespace {
 // The room the platform is given for an install folder.
 constexpr uint32_t kFolderRoom = 512;
 
+// The first record whose id text is `id`, byte for byte; records without an id never match.
+UGCItem* FindById(const PtrArray<UGCItem>& list, const char* id)
+{
+    if (id == nullptr)
+        return nullptr;
+    for (UGCItem* item : list) {
+        if (item->id != nullptr && std::strcmp(item->id, id) == 0)
+            return item;
+    }
+    return nullptr;
+}
+
 }  // namespace
 
 CWorkshopSubscriptions::~CWorkshopSubscriptions()
@@ -66,16 +78,8 @@ UGCItem* CWorkshopSubscriptions::GetItem(int32_t index)
 
 UGCItem* CWorkshopSubscriptions::FindListed(const char* id)
 {
-    UGCItem* match = nullptr;
     ugcService->LockLists();
-    if (id != nullptr) {
-        for (UGCItem* item : ugcService->subscribedItems) {
-            if (item->id != nullptr && std::strcmp(item->id, id) == 0) {
-                match = item;
-                break;
-            }
-        }
-    }
+    UGCItem* match = FindById(ugcService->subscribedItems, id);
     ugcService->UnlockLists();
     return match;
 }
@@ -143,13 +147,7 @@ void CWorkshopSubscriptions::OnQueryCompleted(SteamUGCQueryCompleted_t* result, 
             continue;
 
         InlineString id = FormatString("%llu", static_cast<unsigned long long>(details.m_nPublishedFileId));
-        UGCItem* item = nullptr;
-        for (UGCItem* listed : list) {
-            if (listed->id != nullptr && id.Text() != nullptr && std::strcmp(listed->id, id.Text()) == 0) {
-                item = listed;
-                break;
-            }
-        }
+        UGCItem* item = FindById(list, id.Text());
         if (item == nullptr) {
             item = NewUGCItem();
             ReplaceItemText(item->id, id.Text());

@@ -8,53 +8,31 @@
 #include <vector>
 
 #include "data/Database.h"
-#include "data/XmlReader.h"
 #include "foundation/DecimalText.h"
 
 namespace datatool {
 
 namespace {
 
-bool IsId(const char* name)
-{
-    return name != nullptr && std::strcmp(name, "id") == 0;
-}
-
 // The line of each node tag of the first array "ITEMS", in file order, as the
 // loader makes its nodes; empty when the text does not read.
 std::vector<int> ItemLines(const std::string& path, const std::string& bytes)
 {
     std::vector<int> lines;
-    XmlReader reader;
-    if (!reader.OpenFromMemory(path.c_str(), bytes.data(), static_cast<int64_t>(bytes.size())))
-        return lines;
-    int line = 1;
-    int32_t counted = 0;  // bytes of the text whose line breaks are in `line`
     bool inItems = false;
     bool itemsSeen = false;
-    for (;;) {
-        int32_t start = reader.cursor;
-        while (start < reader.size && std::isspace(static_cast<unsigned char>(reader.data[start])) != 0)
-            ++start;
-        const XmlBlock* block = reader.ReadBlock();
-        if (block == nullptr)
-            return lines;
-        for (; counted < start; ++counted)
-            line += reader.data[counted] == '\n' ? 1 : 0;
-        if (block->name == nullptr)
-            continue;
-        if (std::strcmp(block->name, "array") == 0) {
-            bool named = false;
-            for (int32_t i = 0; i < block->count; ++i)
-                named = named || (IsId(block->attributeNames[i]) &&
-                                  std::strcmp(block->attributeValues[i], "ITEMS") == 0);
-            inItems = !block->closing && named && !itemsSeen;
+    WalkXmlBlocks(path, bytes, [&](const XmlBlock& block, int line) {
+        if (block.name == nullptr)
+            return;
+        if (std::strcmp(block.name, "array") == 0) {
+            const char* id = AttributeValue(block, "id", true);
+            inItems = !block.closing && id != nullptr && std::strcmp(id, "ITEMS") == 0 && !itemsSeen;
             itemsSeen = itemsSeen || inItems;
-        } else if (inItems && std::strcmp(block->name, "node") == 0 &&
-                   !(block->closing && block->count == 0)) {
+        } else if (inItems && std::strcmp(block.name, "node") == 0 && !(block.closing && block.count == 0)) {
             lines.push_back(line);
         }
-    }
+    });
+    return lines;
 }
 
 // What the text holds beside the digits the platform gets.
