@@ -1,6 +1,15 @@
 #include "simclient/Journal.h"
 
+#include <atomic>
+
 namespace simclient {
+
+ThreadSerial ThisThreadSerial()
+{
+    static std::atomic<ThreadSerial> last{0};
+    thread_local const ThreadSerial serial = last.fetch_add(1, std::memory_order_relaxed) + 1;
+    return serial;
+}
 
 std::vector<JournalEntry> Journal::Calls(const std::string& name) const
 {

@@ -17,6 +17,16 @@ template <std::size_t N> void CopyText(char (&out)[N], const std::string& text)
     out[n] = '\0';
 }
 
+// The platform gives install folders in the system's own form: on Windows with "\"
+// between names, whatever the scenario wrote.
+std::string NativeFolder(std::string folder)
+{
+#if defined(_WIN32)
+    std::replace(folder.begin(), folder.end(), '/', '\\');
+#endif
+    return folder;
+}
+
 void SetSubscribed(WorkshopItem& item, bool subscribed)
 {
     item.subscribed = subscribed;
@@ -350,8 +360,9 @@ public:
         if (timeStamp)
             *timeStamp = w.installTimestamp;
         if (folder && cchFolderSize > 0) {
-            std::size_t n = std::min<std::size_t>(w.folder.size(), cchFolderSize - 1);
-            std::memcpy(folder, w.folder.data(), n);
+            const std::string native = NativeFolder(w.folder);
+            std::size_t n = std::min<std::size_t>(native.size(), cchFolderSize - 1);
+            std::memcpy(folder, native.data(), n);
             folder[n] = '\0';
         }
         return true;

@@ -19,7 +19,7 @@ void WorldState::Record(CallName name, std::string args)
 {
     if (!journalEnabled.load(std::memory_order_relaxed))
         return;
-    const std::thread::id thread = std::this_thread::get_id();
+    const ThreadSerial thread = ThisThreadSerial();
     if (!journal.empty()) {
         JournalEntry& last = journal.back();
         if (last.thread == thread && last.name == name.text && last.args == args) {

@@ -1,7 +1,5 @@
 #include "simengine/ModuleLoader.h"
 
-#include <dlfcn.h>
-
 #include "simengine/Engine.h"
 
 namespace simengine {
@@ -9,12 +7,6 @@ namespace simengine {
 namespace {
 
 const char kExportName[] = "OB_GetExtensionModuleInterface";
-
-std::string LastDlError()
-{
-    const char* text = dlerror();
-    return text != nullptr ? text : "unknown error";
-}
 
 }  // namespace
 
@@ -27,18 +19,15 @@ bool ModuleLoader::Load(const std::string& path)
 {
     Unload();
     error_.clear();
-    dlerror();  // clear any stale error text
-    void* library = dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
-    if (library == nullptr) {
-        error_ = "cannot load module '" + path + "': " + LastDlError();
+    if (!library_.Open(path)) {
+        error_ = "cannot load module '" + path + "': " + library_.Error();
         return false;
     }
 
-    dlerror();
-    void* symbol = dlsym(library, kExportName);
+    void* symbol = library_.Find(kExportName);
     if (symbol == nullptr) {
-        error_ = "module '" + path + "' does not export " + kExportName + ": " + LastDlError();
-        dlclose(library);
+        error_ = "module '" + path + "' does not export " + kExportName + ": " + library_.Error();
+        library_.Close();
         return false;
     }
 
@@ -46,10 +35,9 @@ bool ModuleLoader::Load(const std::string& path)
     ExtensionModule* module = getInterface();
     if (module == nullptr) {
         error_ = "module '" + path + "': " + kExportName + " returned null";
-        dlclose(library);
+        library_.Close();
         return false;
     }
-    library_ = library;
     module_ = module;
     path_ = path;
     return true;
@@ -69,21 +57,16 @@ void ModuleLoader::ReleaseModuleObjects()
 
 bool ModuleLoader::Unload()
 {
-    if (library_ == nullptr)
+    if (!library_.IsOpen())
         return true;
     Engine::Instance().QuitAndJoin();
     ReleaseModuleObjects();
-    bool closed = dlclose(library_) == 0;
-    library_ = nullptr;
-    if (!closed) {
-        error_ = "cannot unload module '" + path_ + "': " + LastDlError();
+    if (!library_.Close()) {
+        error_ = "cannot unload module '" + path_ + "': " + library_.Error();
         return false;
     }
-    // RTLD_NOLOAD finds the library only if something keeps it in the process.
-    void* stillThere = dlopen(path_.c_str(), RTLD_NOW | RTLD_LOCAL | RTLD_NOLOAD);
-    if (stillThere != nullptr) {
-        dlclose(stillThere);
-        error_ = "module '" + path_ + "' stays loaded after dlclose; its statics are not fresh";
+    if (DynamicLibrary::IsLoadedAnywhere(path_)) {
+        error_ = "module '" + path_ + "' stays loaded after it was closed; its statics are not fresh";
         return false;
     }
     return true;

@@ -1,7 +1,8 @@
 // The module's one export.
+#include "foundation/Compiler.h"
 #include "frame/ExtensionModuleSteam.h"
 
-extern "C" __attribute__((visibility("default"))) ExtensionModule* OB_GetExtensionModuleInterface()
+STEAMEXT_EXPORT ExtensionModule* OB_GetExtensionModuleInterface()
 {
     // Created once, thread-safely, and never destroyed: the engine holds it
     // until the process ends.

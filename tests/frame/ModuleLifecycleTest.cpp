@@ -1,13 +1,12 @@
 // The module's start, services and stop, as the engine sees them.
 #include <gtest/gtest.h>
 
-#include <dlfcn.h>
-
 #include <atomic>
 #include <thread>
 #include <vector>
 
 #include "ModuleHarness.h"
+#include "simengine/DynamicLibrary.h"
 
 namespace {
 
@@ -29,10 +28,10 @@ TEST_F(ModuleLifecycle, ExportGivesOneObjectEvenWhenCallsRace)
 {
     // Catches an unguarded lazy creation: racing first calls must agree.
     ASSERT_TRUE(loader.Unload());
-    void* library = dlopen(STEAMEXT_MODULE_PATH, RTLD_NOW | RTLD_LOCAL);
-    ASSERT_NE(library, nullptr);
+    simengine::DynamicLibrary library;
+    ASSERT_TRUE(library.Open(STEAMEXT_MODULE_PATH)) << library.Error();
     auto entry =
-        reinterpret_cast<GetExtensionModuleInterfaceFn>(dlsym(library, "OB_GetExtensionModuleInterface"));
+        reinterpret_cast<GetExtensionModuleInterfaceFn>(library.Find("OB_GetExtensionModuleInterface"));
     ASSERT_NE(entry, nullptr);
     std::vector<ExtensionModule*> seen(8);
     std::atomic<bool> go{false};
@@ -51,7 +50,7 @@ TEST_F(ModuleLifecycle, ExportGivesOneObjectEvenWhenCallsRace)
         EXPECT_EQ(each, seen[0]);
     EXPECT_EQ(entry(), seen[0]);
     delete seen[0];
-    dlclose(library);
+    library.Close();
     ASSERT_TRUE(loader.Load(STEAMEXT_MODULE_PATH)) << loader.Error();
     module = loader.Module();
 }

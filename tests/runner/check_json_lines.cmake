@@ -1,7 +1,8 @@
 cmake_minimum_required(VERSION 3.25)
 # `steamext run --json` must give one JSON object per line, the run first and
 # the summary last, with the events and checks of the run in between.
-execute_process(COMMAND ${PROGRAM} run --json ${SCENARIO} RESULT_VARIABLE code OUTPUT_VARIABLE out ERROR_VARIABLE err)
+string(REPLACE "|" ";" EMULATOR "${EMULATOR}")  # the target's emulator, if cross-built
+execute_process(COMMAND ${EMULATOR} ${PROGRAM} run --json ${SCENARIO} RESULT_VARIABLE code OUTPUT_VARIABLE out ERROR_VARIABLE err)
 if(NOT code EQUAL 0)
   message(FATAL_ERROR "exit code ${code}\n${out}${err}")
 endif()

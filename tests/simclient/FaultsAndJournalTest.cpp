@@ -132,7 +132,7 @@ TEST_F(FaultsAndJournal, RepeatsFoldAndTheCursorReadsOnlyWhatIsNew)
         std::vector<std::string> out;
         for (const auto& e : j.Entries())
             out.push_back(e.args + "x" + std::to_string(e.count) +
-                          (e.thread == std::this_thread::get_id() ? "" : " elsewhere"));
+                          (e.thread == simclient::ThisThreadSerial() ? "" : " elsewhere"));
         return out;
     };
     simclient::JournalMark mark = world.JournalMark();

@@ -1,5 +1,6 @@
-// Record layouts must match the platform's 4-byte callback packing on this OS, and the
-// callback numbers the platform's; all checked when compiled.
+// Record layouts must match the platform's callback packing, and the callback numbers
+// the platform's; all checked when compiled. The packing is 4 bytes on Linux and 8 on
+// Windows, so some sizes and offsets differ between the two.
 #include <cstddef>
 
 #include <gtest/gtest.h>
@@ -7,50 +8,55 @@
 
 #define CHECK_SIZE(T, n) static_assert(sizeof(T) == (n), #T " size")
 #define CHECK_OFFSET(T, f, n) static_assert(offsetof(T, f) == (n), #T "::" #f " offset")
+#if defined(VALVE_CALLBACK_PACK_SMALL)
+#define BY_PACKING(small, large) (small)
+#else
+#define BY_PACKING(small, large) (large)
+#endif
 
 CHECK_SIZE(CSteamID, 8);
 static_assert(alignof(CSteamID) == 1, "CSteamID is byte-aligned");
 CHECK_SIZE(GameOverlayActivated_t, 1);
-CHECK_SIZE(UserStatsReceived_t, 20);
+CHECK_SIZE(UserStatsReceived_t, BY_PACKING(20, 24));
 CHECK_OFFSET(UserStatsReceived_t, m_eResult, 8);
 CHECK_OFFSET(UserStatsReceived_t, m_steamIDUser, 12);
-CHECK_SIZE(UserStatsStored_t, 12);
-CHECK_SIZE(UserAchievementStored_t, 148);
+CHECK_SIZE(UserStatsStored_t, BY_PACKING(12, 16));
+CHECK_SIZE(UserAchievementStored_t, BY_PACKING(148, 152));
 CHECK_OFFSET(UserAchievementStored_t, m_rgchAchievementName, 9);
 CHECK_OFFSET(UserAchievementStored_t, m_nCurProgress, 140);
 CHECK_OFFSET(UserAchievementStored_t, m_nMaxProgress, 144);
-CHECK_SIZE(LeaderboardFindResult_t, 12);
-CHECK_SIZE(LeaderboardScoresDownloaded_t, 20);
+CHECK_SIZE(LeaderboardFindResult_t, BY_PACKING(12, 16));
+CHECK_SIZE(LeaderboardScoresDownloaded_t, BY_PACKING(20, 24));
 CHECK_OFFSET(LeaderboardScoresDownloaded_t, m_cEntryCount, 16);
-CHECK_SIZE(LeaderboardScoreUploaded_t, 28);
-CHECK_OFFSET(LeaderboardScoreUploaded_t, m_hSteamLeaderboard, 4);
-CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nScore, 12);
-CHECK_OFFSET(LeaderboardScoreUploaded_t, m_bScoreChanged, 16);
-CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankNew, 20);
-CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankPrevious, 24);
+CHECK_SIZE(LeaderboardScoreUploaded_t, BY_PACKING(28, 32));
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_hSteamLeaderboard, BY_PACKING(4, 8));
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nScore, BY_PACKING(12, 16));
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_bScoreChanged, BY_PACKING(16, 20));
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankNew, BY_PACKING(20, 24));
+CHECK_OFFSET(LeaderboardScoreUploaded_t, m_nGlobalRankPrevious, BY_PACKING(24, 28));
 CHECK_SIZE(SteamUGCQueryCompleted_t, 280);
 CHECK_OFFSET(SteamUGCQueryCompleted_t, m_bCachedData, 20);
 CHECK_OFFSET(SteamUGCQueryCompleted_t, m_rgchNextCursor, 21);
-CHECK_SIZE(CreateItemResult_t, 16);
-CHECK_OFFSET(CreateItemResult_t, m_nPublishedFileId, 4);
-CHECK_OFFSET(CreateItemResult_t, m_bUserNeedsToAcceptWorkshopLegalAgreement, 12);
+CHECK_SIZE(CreateItemResult_t, BY_PACKING(16, 24));
+CHECK_OFFSET(CreateItemResult_t, m_nPublishedFileId, BY_PACKING(4, 8));
+CHECK_OFFSET(CreateItemResult_t, m_bUserNeedsToAcceptWorkshopLegalAgreement, BY_PACKING(12, 16));
 CHECK_SIZE(SubmitItemUpdateResult_t, 16);
 CHECK_OFFSET(SubmitItemUpdateResult_t, m_bUserNeedsToAcceptWorkshopLegalAgreement, 4);
 CHECK_OFFSET(SubmitItemUpdateResult_t, m_nPublishedFileId, 8);
-CHECK_SIZE(LeaderboardEntry_t, 28);
-CHECK_OFFSET(LeaderboardEntry_t, m_hUGC, 20);
-CHECK_SIZE(SteamParamStringArray_t, 12);
-CHECK_SIZE(SteamUGCDetails_t, 9764);
-CHECK_OFFSET(SteamUGCDetails_t, m_ulSteamIDOwner, 8156);
-CHECK_OFFSET(SteamUGCDetails_t, m_eVisibility, 8176);
-CHECK_OFFSET(SteamUGCDetails_t, m_rgchTags, 8183);
-CHECK_OFFSET(SteamUGCDetails_t, m_hFile, 9208);
-CHECK_OFFSET(SteamUGCDetails_t, m_pchFileName, 9224);
-CHECK_OFFSET(SteamUGCDetails_t, m_nFileSize, 9484);
-CHECK_OFFSET(SteamUGCDetails_t, m_rgchURL, 9492);
-CHECK_OFFSET(SteamUGCDetails_t, m_unNumChildren, 9760);
-CHECK_SIZE(RemoteStorageSubscribePublishedFileResult_t, 12);
-CHECK_SIZE(PersonaStateChange_t, 12);
+CHECK_SIZE(LeaderboardEntry_t, BY_PACKING(28, 32));
+CHECK_OFFSET(LeaderboardEntry_t, m_hUGC, BY_PACKING(20, 24));
+CHECK_SIZE(SteamParamStringArray_t, BY_PACKING(12, 16));
+CHECK_SIZE(SteamUGCDetails_t, BY_PACKING(9764, 9776));
+CHECK_OFFSET(SteamUGCDetails_t, m_ulSteamIDOwner, BY_PACKING(8156, 8160));
+CHECK_OFFSET(SteamUGCDetails_t, m_eVisibility, BY_PACKING(8176, 8180));
+CHECK_OFFSET(SteamUGCDetails_t, m_rgchTags, BY_PACKING(8183, 8187));
+CHECK_OFFSET(SteamUGCDetails_t, m_hFile, BY_PACKING(9208, 9216));
+CHECK_OFFSET(SteamUGCDetails_t, m_pchFileName, BY_PACKING(9224, 9232));
+CHECK_OFFSET(SteamUGCDetails_t, m_nFileSize, BY_PACKING(9484, 9492));
+CHECK_OFFSET(SteamUGCDetails_t, m_rgchURL, BY_PACKING(9492, 9500));
+CHECK_OFFSET(SteamUGCDetails_t, m_unNumChildren, BY_PACKING(9760, 9768));
+CHECK_SIZE(RemoteStorageSubscribePublishedFileResult_t, BY_PACKING(12, 16));
+CHECK_SIZE(PersonaStateChange_t, BY_PACKING(12, 16));
 
 #define CHECK_NUMBER(T, n) static_assert(T::k_iCallback == (n), #T " callback number")
 CHECK_NUMBER(GameOverlayActivated_t, 331);

@@ -7,6 +7,15 @@
 
 namespace {
 
+// The platform gives install folders in the system's own form.
+std::string NativeFolder(std::string folder)
+{
+#if defined(_WIN32)
+    std::replace(folder.begin(), folder.end(), '/', '\\');
+#endif
+    return folder;
+}
+
 class LeaderboardsWorkshop : public SimWorld {
 protected:
     uint64 Id(uint32 account) { return 76561197960265728ull + account; }
@@ -211,7 +220,7 @@ TEST_F(LeaderboardsWorkshop, WorkshopSubscriptionsAndInstallInfo)
     uint32 stamp = 0;
     char folder[5];
     EXPECT_TRUE(ugc->GetItemInstallInfo(77, &size, folder, sizeof folder, &stamp));
-    EXPECT_STREQ(folder, "/ugc");
+    EXPECT_EQ(std::string(folder), NativeFolder("/ugc"));
     EXPECT_EQ(size, 1234u);
 
     auto unsub = Await<RemoteStorageUnsubscribePublishedFileResult_t>(ugc->UnsubscribeItem(77));
@@ -287,7 +296,7 @@ TEST_F(LeaderboardsWorkshop, DownloadAndUploadMoveByThemselves)
     }
     char folder[16] = {};
     EXPECT_TRUE(ugc->GetItemInstallInfo(90, nullptr, folder, sizeof folder, nullptr));
-    EXPECT_STREQ(folder, "/ugc/90");
+    EXPECT_EQ(std::string(folder), NativeFolder("/ugc/90"));
 
     world.SetWorkshopUpload(
         simclient::WorkshopUpload{4, 2, simclient::Delay::Pumps(1), k_EResultLimitExceeded});

@@ -44,7 +44,7 @@ TEST_F(Threads, WorkersCallWhileMainThreadPumps)
     EXPECT_EQ(c.calls, kWorkers * kCalls);
     EXPECT_EQ(world.GetJournal().Count("StoreStats"), size_t(kWorkers * kCalls));
     EXPECT_EQ(world.LeaderboardRows("b").at(0).score, kCalls - 1);
-    std::set<std::thread::id> threads;
+    std::set<simclient::ThreadSerial> threads;
     for (const auto& e : world.GetJournal().Calls("FileWrite"))
         threads.insert(e.thread);
     EXPECT_EQ(threads.size(), size_t(kWorkers));

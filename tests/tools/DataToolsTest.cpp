@@ -1,9 +1,5 @@
 // steamext data check / dump / scramble / unscramble, run as a game developer runs
 // them: the built program in a scratch folder, paths relative to it.
-#include <sys/wait.h>
-#include <unistd.h>
-
-#include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -13,25 +9,15 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
+#include "ProgramRun.h"
+
 namespace {
 
 namespace fs = std::filesystem;
 // Ordered, so that comparing two dumps also compares their key order.
 using Json = nlohmann::ordered_json;
 
-struct Outcome {
-    int status = -1;
-    std::string out;
-    std::string err;
-};
-
-std::string Quote(const std::string& text)
-{
-    std::string quoted = "'";
-    for (const char c : text)
-        quoted += c == '\'' ? std::string("'\\''") : std::string(1, c);
-    return quoted + "'";
-}
+using Outcome = testsupport::ProgramOutcome;
 
 std::string ReadBytes(const fs::path& path)
 {
@@ -62,8 +48,9 @@ protected:
     void SetUp() override
     {
         static int serial = 0;
-        root_ = fs::temp_directory_path() /
-                ("steamext_tools_" + std::to_string(getpid()) + "_" + std::to_string(++serial));
+        root_ =
+            fs::temp_directory_path() / ("steamext_tools_" + std::to_string(testsupport::ThisProcessId()) +
+                                         "_" + std::to_string(++serial));
         fs::remove_all(root_);
         fs::create_directories(root_ / "w");
     }
@@ -74,21 +61,7 @@ protected:
 
     Outcome Run(const std::vector<std::string>& args) const
     {
-        std::string command = "cd " + Quote(Work().string()) + " && " + Quote(STEAMEXT_PROGRAM);
-        for (const std::string& arg : args)
-            command += " " + Quote(arg);
-        command += " 2>" + Quote((root_ / "stderr").string());
-        Outcome outcome;
-        FILE* pipe = popen(command.c_str(), "r");
-        if (pipe == nullptr)
-            return outcome;
-        char buffer[4096];
-        for (size_t got; (got = fread(buffer, 1, sizeof buffer, pipe)) > 0;)
-            outcome.out.append(buffer, got);
-        const int raw = pclose(pipe);
-        outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
-        outcome.err = ReadBytes(root_ / "stderr");
-        return outcome;
+        return testsupport::RunProgram(STEAMEXT_PROGRAM, args, Work(), root_);
     }
 
     // A refusal: non-zero status, nothing on stdout, one line on stderr naming the fault.

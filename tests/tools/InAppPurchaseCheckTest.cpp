@@ -1,28 +1,23 @@
 // "steamext data check" on the store's configuration: a warning, with its line,
 // for each item the module would silently never sell or never report.
-#include <unistd.h>
-
-#include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <string>
+#include <vector>
 
 #include <gtest/gtest.h>
+
+#include "ProgramRun.h"
 
 namespace {
 
 namespace fs = std::filesystem;
 
-struct Outcome {
-    int status = -1;
-    std::string out;
-};
-
 class InAppPurchaseCheck : public ::testing::Test {
 protected:
     void SetUp() override
     {
-        root_ = fs::temp_directory_path() / ("steamext_iap_" + std::to_string(getpid()));
+        root_ = fs::temp_directory_path() / ("steamext_iap_" + std::to_string(testsupport::ThisProcessId()));
         fs::remove_all(root_);
         fs::create_directories(root_ / "in-app-purchases");
     }
@@ -33,19 +28,11 @@ protected:
         std::ofstream(root_ / "in-app-purchases" / "in-app-purchases.xml", std::ios::binary) << text;
     }
 
-    Outcome Check(const std::string& flags) const
+    testsupport::ProgramOutcome Check(std::vector<std::string> arguments) const
     {
-        const std::string command = "cd '" + root_.string() + "' && '" + STEAMEXT_PROGRAM + "' data check " +
-                                    flags + " in-app-purchases/in-app-purchases.xml 2>/dev/null";
-        Outcome outcome;
-        FILE* pipe = popen(command.c_str(), "r");
-        char buffer[512];
-        size_t n = 0;
-        while ((n = std::fread(buffer, 1, sizeof buffer, pipe)) > 0)
-            outcome.out.append(buffer, n);
-        const int status = pclose(pipe);
-        outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-        return outcome;
+        arguments.insert(arguments.begin(), {"data", "check"});
+        arguments.push_back("in-app-purchases/in-app-purchases.xml");
+        return testsupport::RunProgram(STEAMEXT_PROGRAM, arguments, root_, root_);
     }
 
     fs::path root_;
@@ -81,11 +68,11 @@ TEST_F(InAppPurchaseCheck, WarnsWithTheLineAboutWhatTheModuleIgnores)
         ":11: item \"1005\": \"steam_id\" \"+1005\" is not plain decimal digits: the platform is "
         "asked about 1005, the store address gets the whole text\n" +
         file + ": ok (1 arrays, 8 nodes), 7 warnings\n";
-    Outcome plain = Check("");
+    testsupport::ProgramOutcome plain = Check({});
     EXPECT_EQ(plain.status, 0);
     EXPECT_EQ(plain.out, expected);
 
-    Outcome strict = Check("--strict");
+    testsupport::ProgramOutcome strict = Check({"--strict"});
     EXPECT_EQ(strict.status, 1);
     EXPECT_NE(strict.out.find(file + ": FAILED under --strict (7 warnings)\n"), std::string::npos)
         << strict.out;
@@ -96,12 +83,12 @@ TEST_F(InAppPurchaseCheck, CleanFilesPassStrict)
     Put("<?xml version=\"1.0\"?>\n<root>\n<array id=\"ITEMS\">\n<node id=\"1001\" steam_id=\"1001\"/>\n"
         "</array>\n<array id=\"ITEMS\">\n<node id=\"x\" steam_id=\"0\"/>\n</array>\n</root>\n");
     // The second array is never read, so nothing in it is warned about.
-    Outcome strict = Check("--strict");
+    testsupport::ProgramOutcome strict = Check({"--strict"});
     EXPECT_EQ(strict.status, 0);
     EXPECT_EQ(strict.out, "in-app-purchases/in-app-purchases.xml: ok (2 arrays, 2 nodes)\n");
 
     Put("<?xml version=\"1.0\"?>\n<root>\n<array id=\"SHOP\">\n</array>\n</root>\n");
-    EXPECT_EQ(Check("--strict").status, 1);
+    EXPECT_EQ(Check({"--strict"}).status, 1);
 }
 
 }  // namespace

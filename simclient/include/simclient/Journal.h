@@ -7,15 +7,19 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
-#include <thread>
 #include <vector>
 
 namespace simclient {
 
+// Each thread that calls gets a number of its own, never reused while the process lives:
+// a system may hand a finished thread's std::thread::id to a later thread.
+using ThreadSerial = uint64_t;
+ThreadSerial ThisThreadSerial();
+
 struct JournalEntry {
     std::string name;  // method name without interface, e.g. "FileWrite", "SteamAPI_Init"
     std::string args;  // arguments as text, comma-separated; strings quoted, null as null
-    std::thread::id thread;
+    ThreadSerial thread = 0;
     uint64_t count = 1;  // identical calls in a row folded into this entry
 };
 

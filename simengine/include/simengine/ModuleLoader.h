@@ -1,5 +1,5 @@
-// Loads the module file the way the engine does: dlopen with RTLD_NOW |
-// RTLD_LOCAL, look up "OB_GetExtensionModuleInterface", call it. Unloading
+// Loads the module file the way the engine does: open the library, look up
+// "OB_GetExtensionModuleInterface", call it. Unloading
 // first quits and joins the engine's threads (the module never joins its own,
 // and they run the module's code), then closes the library so that the next
 // load starts with fresh module statics.
@@ -8,6 +8,7 @@
 #include <string>
 
 #include "frame/ExtensionModule.h"
+#include "simengine/DynamicLibrary.h"
 
 namespace simengine {
 
@@ -21,18 +22,18 @@ public:
     // False with Error() set when the file, the export or its object is missing.
     bool Load(const std::string& path);
     ExtensionModule* Module() const { return module_; }
-    bool IsLoaded() const { return library_ != nullptr; }
+    bool IsLoaded() const { return library_.IsOpen(); }
     const std::string& Error() const { return error_; }
 
     // Quits and joins the engine's threads, releases the services and the
-    // module object through their virtual destructors, then dlclose. True if the library
+    // module object through their virtual destructors, then closes the library. True if it
     // is really gone from the process afterwards (its statics will be fresh).
     bool Unload();
 
 private:
     void ReleaseModuleObjects();
 
-    void* library_ = nullptr;
+    DynamicLibrary library_;
     ExtensionModule* module_ = nullptr;
     std::string path_;
     std::string error_;

@@ -24,7 +24,7 @@ namespace {
 // ---- Thread names, kept by the StartThread wrapper.
 
 std::mutex threadNamesMutex;
-std::map<std::thread::id, std::string> threadNames;
+std::map<simclient::ThreadSerial, std::string> threadNames;
 std::set<std::string> startedNames;  // every name the module has started a thread with
 HostThreadApi* engineThreads = nullptr;
 
@@ -45,7 +45,7 @@ void NamedEntry(void* launchArgument)
     std::unique_ptr<Launch> launch(static_cast<Launch*>(launchArgument));
     {
         std::lock_guard<std::mutex> lock(threadNamesMutex);
-        threadNames[std::this_thread::get_id()] = launch->name;
+        threadNames[simclient::ThisThreadSerial()] = launch->name;
     }
     launch->entry(launch->argument);
 }
@@ -291,7 +291,7 @@ int EngineSession::RunningThreads(const std::string& name) const
     return state_->engine.Threads().RunningCount(name);
 }
 
-std::string EngineSession::ThreadName(std::thread::id id) const
+std::string EngineSession::ThreadName(simclient::ThreadSerial id) const
 {
     std::lock_guard<std::mutex> lock(threadNamesMutex);
     auto found = threadNames.find(id);

@@ -13,6 +13,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include <simclient/Journal.h>
 #include <simengine/Engine.h>
 
 #include "run/Scenario.h"
@@ -68,7 +69,7 @@ public:
     // What the module did to the engine since the last call, in order.
     std::vector<nlohmann::json> TakeRecords();
     // The name a thread of the module was started with, or "" if unknown.
-    std::string ThreadName(std::thread::id id) const;
+    std::string ThreadName(simclient::ThreadSerial id) const;
     // Threads of this name that the module started and that have not ended yet; -1 when
     // the module never started one of this name.
     int RunningThreads(const std::string& name) const;

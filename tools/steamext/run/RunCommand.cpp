@@ -1,13 +1,12 @@
 // `steamext run [FILE] [--module PATH] [--json] [-v]`: play a scenario, or the
 // built-in tour, against the built module.
-#include <unistd.h>
-
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <sstream>
 
+#include "ProcessFacts.h"
 #include "Subcommands.h"
 #include "run/EngineSession.h"
 #include "run/Runner.h"
@@ -27,11 +26,10 @@ struct RunArguments {
 // The module built beside this program.
 std::string DefaultModulePath()
 {
-    std::error_code error;
-    std::filesystem::path self = std::filesystem::read_symlink("/proc/self/exe", error);
-    if (error)
-        return "libsteam_extension.so";
-    return (self.parent_path() / "libsteam_extension.so").string();
+    std::filesystem::path self = ThisProgramPath();
+    if (self.empty())
+        return STEAMEXT_MODULE_FILE_NAME;
+    return (self.parent_path() / STEAMEXT_MODULE_FILE_NAME).string();
 }
 
 int Fail(const std::string& message)
@@ -72,7 +70,7 @@ int Run(const RunArguments& arguments)
         return Fail("the module file " + options.modulePath +
                     " does not exist; build the target steam_extension, or give --module PATH");
 
-    bool colour = !arguments.json && isatty(STDOUT_FILENO) && std::getenv("NO_COLOR") == nullptr;
+    bool colour = !arguments.json && StandardOutputIsTerminal() && std::getenv("NO_COLOR") == nullptr;
     std::unique_ptr<Timeline> timeline = arguments.json
                                              ? MakeJsonTimeline(std::cout)
                                              : MakeReadableTimeline(std::cout, colour, arguments.verbose);
@@ -98,7 +96,7 @@ void AddRunSubcommand(CLI::App& app, SubcommandAction& action)
         "run", "Play a scenario against the built module (with no FILE: the built-in tour)");
     run->add_option("FILE", arguments->file, "Scenario file (JSON); see docs/scenarios.md");
     run->add_option("--module", arguments->module,
-                    "Module file to load (default: libsteam_extension.so beside this program)");
+                    "Module file to load (default: " STEAMEXT_MODULE_FILE_NAME " beside this program)");
     run->add_flag("--json", arguments->json, "Write the whole journal as JSON lines instead of a timeline");
     run->add_flag("-v,--verbose", arguments->verbose, "Also show every platform call the module makes");
     run->callback([&action, arguments] { action = [arguments] { return steamext::run::Run(*arguments); }; });

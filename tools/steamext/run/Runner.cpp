@@ -53,7 +53,7 @@ public:
                 world.SetCallObserver({});
             }
         } clientRelease{world_};
-        mainThread_ = std::this_thread::get_id();
+        mainThread_ = simclient::ThisThreadSerial();
 
         timeline_.Begin(scenario_.name, scenario_.description, options_.modulePath);
         ExtensionModule* module = engine.LoadModule(options_.modulePath);
@@ -295,7 +295,7 @@ private:
             Fail(currentStep_, "step #" + std::to_string(currentStep_) + ": " + DescribeRecord(record));
     }
 
-    std::string ThreadLabel(std::thread::id id)
+    std::string ThreadLabel(simclient::ThreadSerial id)
     {
         if (id == mainThread_)
             return "main";
@@ -324,8 +324,8 @@ private:
     uint64_t frame_ = 0;
     std::size_t currentStep_ = 0;
     simclient::JournalMark platformMark_;
-    std::thread::id mainThread_;
-    std::map<std::thread::id, std::string> otherThreads_;
+    simclient::ThreadSerial mainThread_ = 0;
+    std::map<simclient::ThreadSerial, std::string> otherThreads_;
     std::vector<json> stepRecords_;
     KeptRecords kept_;
     RunSummary summary_;
