@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Every test: the format check, the suite, clang-tidy's checks, the suite again under
-# AddressSanitizer+UBSan, the threaded tests under ThreadSanitizer, and the fuzz
-# targets for a bounded time.
+# AddressSanitizer+UBSan, the threaded tests under ThreadSanitizer, the fuzz targets
+# for a bounded time, and the suite cross-built for 64-bit Windows, run under Wine.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 scripts/setup.sh
@@ -35,4 +35,10 @@ if [ -x fuzz/run_fuzzers.sh ]; then
   echo "== fuzz targets (bounded)"
   fuzz/run_fuzzers.sh
 fi
+
+echo "== build and test for 64-bit Windows (mingw-w64, run under Wine)"
+scripts/wine_prefix.sh
+cmake --preset windows >/dev/null
+cmake --build --preset windows -j$jobs
+ctest --preset windows -j$jobs
 echo "all test stages passed"
