@@ -65,10 +65,9 @@ public:
     // Names of the threads still running, each once.
     std::vector<std::string> RunningNames() const;
 
-    // Name of the calling thread: its StartThread name, or the name set here
-    // ("main" for a thread the engine did not start).
+    // Name of the calling thread: its StartThread name, or "main" for a thread the
+    // engine did not start.
     static std::string CurrentName();
-    static void SetCurrentName(std::string name);
 
 private:
     struct Tracked {
