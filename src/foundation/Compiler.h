@@ -14,10 +14,10 @@
 // mingw's C library is told to follow the C standard's printf (64-bit %lld, %zu), so its
 // formats are checked as GNU's; MSVC has no such attribute.
 #if defined(__MINGW32__)
-#define STEAMEXT_PRINTF_FORMAT(formatIndex, firstArgument) \
+#define STEAMEXT_PRINTF_FORMAT(formatIndex, firstArgument)                                                   \
     __attribute__((format(gnu_printf, formatIndex, firstArgument)))
 #elif defined(__GNUC__) || defined(__clang__)
-#define STEAMEXT_PRINTF_FORMAT(formatIndex, firstArgument) \
+#define STEAMEXT_PRINTF_FORMAT(formatIndex, firstArgument)                                                   \
     __attribute__((format(printf, formatIndex, firstArgument)))
 #else
 #define STEAMEXT_PRINTF_FORMAT(formatIndex, firstArgument)

@@ -291,8 +291,9 @@ TEST_F(LeaderboardSoak, ManyRequestsAndSubmissionsOnFaultyBoards)
             }
         }
         const bool quiet = engine.Time().NowMs() - lastUploadMs > 10000;
-        const bool ended = quiet && (std::chrono::steady_clock::now() - lastUploadReal > std::chrono::seconds(5) ||
-                                     everySubmissionEnded());
+        const bool ended =
+            quiet && (std::chrono::steady_clock::now() - lastUploadReal > std::chrono::seconds(5) ||
+                      everySubmissionEnded());
         if (ended && engine.Threads().RunningCount(kResultsThread) == 0 && world.BoundCallResultCount() == 0)
             break;
         ASSERT_LT(std::chrono::steady_clock::now(), guard) << "the soak did not settle";
