@@ -11,11 +11,11 @@ namespace simengine {
 
 namespace {
 
-// Both trivially destructible on purpose: with mingw-w64's emulated thread-local storage a
-// thread_local whose destructor runs at thread exit may run after its storage was freed,
-// and corrupt the heap.
-thread_local const std::string* currentThreadName = nullptr;  // the record's name; null: "main"
-thread_local void* currentTracked = nullptr;  // the calling thread's record, if the engine started it
+// The calling thread's record, if the engine started it; its name is the thread's name.
+// A plain pointer on purpose: with mingw-w64's emulated thread-local storage, a
+// thread_local whose destructor runs at thread exit may run after its storage was
+// freed, and corrupt the heap. The record outlives the thread: it is joined first.
+thread_local void* currentTracked = nullptr;
 
 }  // namespace
 
@@ -41,7 +41,6 @@ void ThreadRegistry::Start(const char* name, HostThreadEntry entry, void* argume
     // The thread is started under the lock so that a join never sees a
     // record whose std::thread is still being assigned.
     self->thread = std::thread([this, self, entry, argument] {
-        currentThreadName = &self->name;  // the record outlives the thread: it is joined first
         currentTracked = self;
         // The OS name helps in debuggers; it is cut to 15 characters there.
         pthread_setname_np(pthread_self(), self->name.substr(0, 15).c_str());
@@ -196,7 +195,8 @@ std::vector<std::string> ThreadRegistry::RunningNames() const
 
 std::string ThreadRegistry::CurrentName()
 {
-    return currentThreadName != nullptr ? *currentThreadName : "main";
+    const auto* self = static_cast<const Tracked*>(currentTracked);
+    return self != nullptr ? self->name : "main";
 }
 
 }  // namespace simengine
