@@ -18,6 +18,11 @@ set(CMAKE_EXE_LINKER_FLAGS_INIT "-static")
 set(CMAKE_SHARED_LINKER_FLAGS_INIT "-static")
 set(CMAKE_MODULE_LINKER_FLAGS_INIT "-static")
 
-# Quiet, and without the .NET and HTML runtimes Wine would offer to install.
+# Quiet, and without the .NET and HTML runtimes Wine would offer to install. Address-space
+# randomisation off (children inherit it): with it, Wine now and then finds the fixed address
+# it needs for a new process taken, and the process dies before it starts ("failed to map
+# the shared user data"), which fails whichever test was starting it.
 find_program(STEAMEXT_WINE NAMES wine wine64 REQUIRED)
-set(CMAKE_CROSSCOMPILING_EMULATOR /usr/bin/env WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml= ${STEAMEXT_WINE})
+find_program(STEAMEXT_SETARCH NAMES setarch REQUIRED)
+set(CMAKE_CROSSCOMPILING_EMULATOR ${STEAMEXT_SETARCH} x86_64 -R /usr/bin/env WINEDEBUG=-all
+                                  WINEDLLOVERRIDES=mscoree,mshtml= ${STEAMEXT_WINE})

@@ -38,6 +38,8 @@ fi
 
 echo "== build and test for 64-bit Windows (mingw-w64, run under Wine)"
 scripts/wine_prefix.sh
+scripts/wine_server.sh start
+trap 'scripts/wine_server.sh stop' EXIT
 cmake --preset windows >/dev/null
 cmake --build --preset windows -j$jobs
 ctest --preset windows -j$jobs
