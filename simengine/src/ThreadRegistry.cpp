@@ -129,7 +129,7 @@ void ThreadRegistry::NoteCall(const char* name, const std::string& args)
     if (self->recent.size() > kMaxPollCycle)
         self->recent.erase(self->recent.begin());
     self->sinceTurn.push_back(call);
-    if (self->sinceTurn.size() > 2 * kMaxPollCycle)
+    if (self->sinceTurn.size() > kPollRepeats * kMaxPollCycle)
         self->sinceTurn.erase(self->sinceTurn.begin());
 }
 
@@ -167,10 +167,14 @@ void ThreadRegistry::NewEngineTurn()
 bool ThreadRegistry::Polls(const std::vector<std::string>& calls)
 {
     const std::size_t n = calls.size();
-    for (std::size_t cycle = 1; cycle <= kMaxPollCycle && 2 * cycle <= n; ++cycle)
-        if (std::equal(calls.end() - static_cast<std::ptrdiff_t>(cycle), calls.end(),
-                       calls.end() - static_cast<std::ptrdiff_t>(2 * cycle)))
+    for (std::size_t cycle = 1; cycle <= kMaxPollCycle && kPollRepeats * cycle <= n; ++cycle) {
+        const auto last = calls.end() - static_cast<std::ptrdiff_t>(cycle);
+        bool repeats = true;
+        for (std::size_t back = 2; back <= kPollRepeats && repeats; ++back)
+            repeats = std::equal(last, calls.end(), calls.end() - static_cast<std::ptrdiff_t>(back * cycle));
+        if (repeats)
             return true;
+    }
     return false;
 }
 

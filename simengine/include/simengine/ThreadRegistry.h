@@ -11,9 +11,12 @@
 // sees the platform's calls notes them too (NoteCall). A thread polls when,
 // since the engine's thread last acted (NewEngineTurn) and since any other
 // thread last made progress, its calls repeat one cycle of at most
-// kMaxPollCycle calls twice over: it has looked at the state the others left
-// and found nothing new. Progress is a call the thread had not made among its
-// last kMaxPollCycle calls, going to sleep, or ending.
+// kMaxPollCycle calls kPollRepeats times over: it has looked at the state the
+// others left and found nothing new. Three, not two: the first cycle may end a
+// look begun before that progress, and the second, the first fresh look, may
+// have found something the thread acts on only after its last noted call.
+// Progress is a call the thread had not made among its last kMaxPollCycle
+// calls, going to sleep, or ending.
 #pragma once
 
 #include <atomic>
@@ -50,6 +53,7 @@ public:
     int RunningCount(const std::string& name) const;
 
     static constexpr std::size_t kMaxPollCycle = 4;
+    static constexpr std::size_t kPollRepeats = 3;
     // A call of the calling thread, by name and arguments as text. Calls of
     // threads the engine did not start are not watched (and cost nothing).
     void NoteCall(const char* name, const std::string& args);
