@@ -167,12 +167,12 @@ void ThreadRegistry::NewEngineTurn()
 bool ThreadRegistry::Polls(const std::vector<std::string>& calls)
 {
     const std::size_t n = calls.size();
+    // The last kPollRepeats cycles are one cycle repeated when every call equals the one
+    // a cycle before it.
     for (std::size_t cycle = 1; cycle <= kMaxPollCycle && kPollRepeats * cycle <= n; ++cycle) {
-        const auto last = calls.end() - static_cast<std::ptrdiff_t>(cycle);
-        bool repeats = true;
-        for (std::size_t back = 2; back <= kPollRepeats && repeats; ++back)
-            repeats = std::equal(last, calls.end(), calls.end() - static_cast<std::ptrdiff_t>(back * cycle));
-        if (repeats)
+        const auto span = static_cast<std::ptrdiff_t>(kPollRepeats * cycle);
+        if (std::equal(calls.end() - span + static_cast<std::ptrdiff_t>(cycle), calls.end(),
+                       calls.end() - span))
             return true;
     }
     return false;
